@@ -1,0 +1,11 @@
+// All of nax: every public header of the library.
+#ifndef NAX_NAX_H
+#define NAX_NAX_H
+
+#include "nax/types.h"
+#include "nax/scalar.h"
+#include "nax/complex.h"
+#include "nax/base_vector.h"
+#include "nax/vector_n.h"
+
+#endif  // NAX_NAX_H
