@@ -7,5 +7,8 @@
 #include "nax/complex.h"
 #include "nax/base_vector.h"
 #include "nax/vector_n.h"
+#include "nax/sorting.h"
+#include "nax/statistics.h"
+#include "nax/random.h"
 
 #endif  // NAX_NAX_H

@@ -1,0 +1,4 @@
+#include "nax/random.h"
+
+template class CNaxRandom<float>;
+template class CNaxRandom<double>;
