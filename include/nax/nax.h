@@ -10,5 +10,8 @@
 #include "nax/sorting.h"
 #include "nax/statistics.h"
 #include "nax/random.h"
+#include "nax/wavelet_filter.h"
+#include "nax/lifting.h"
+#include "nax/channel.h"
 
 #endif  // NAX_NAX_H
