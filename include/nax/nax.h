@@ -20,6 +20,7 @@
 #include "nax/matrix4.h"
 #include "nax/fixed_matrix_routines.h"
 #include "nax/algebra.h"
+#include "nax/interpolation.h"
 #include "nax/sorting.h"
 #include "nax/statistics.h"
 #include "nax/random.h"

@@ -17,6 +17,7 @@
 #include <type_traits>
 
 #include "nax/types.h"
+#include "nax/vector2.h"
 
 namespace nax::detail {
 
@@ -253,6 +254,14 @@ template <typename T>
 inline void CopyValues(int32 n, const T* source, T* destination) {
   if (n > 0 && source != destination) std::copy(source, source + n, destination);
 }
+
+/// View of pairs held as 2-vectors: pair k is (v[k][0], v[k][1]).
+template <typename T>
+struct VectorPairs {
+  CNaxVector2<T>* v;
+  T Get(int32 k, int32 component) const { return v[k][component]; }
+  void Set(int32 k, int32 component, T value) const { v[k][component] = value; }
+};
 
 /// View of `size` pairs stored as interleaved values: pair k is (p[2k], p[2k + 1]).
 template <typename T>
@@ -495,6 +504,16 @@ void naxSort2DArray(int32 size, const T* source, T* destination, T tolerance, in
                          absolute, byFirst);
 }
 
+/// naxSort2DArray on 2-vectors: sorts by component 0 when `byFirst` is non-zero, else by
+/// component 1, ordering runs of near-equal keys by the other component.
+template <typename T>
+void naxSort2DVectors(int32 size, int32 byFirst, const CNaxVector2<T>* source,
+                      CNaxVector2<T>* destination, T tolerance, int32 ascending, int32 absolute) {
+  nax::detail::SortPairs(size, nax::detail::VectorPairs<T>{const_cast<CNaxVector2<T>*>(source)},
+                         nax::detail::VectorPairs<T>{destination}, tolerance, ascending, absolute,
+                         byFirst);
+}
+
 template <typename T>
 CNaxSorting<T>& CNaxSorting<T>::operator=(const CNaxSorting& other) {
   if (this != &other) SetData(other.size, other.array, other.external, other.ascending,
@@ -576,5 +595,9 @@ int32 CNaxSorting<T>::IsArraySorted(int32 isAscending, int32 isAbsolute) const {
   extern template void naxSort2DArray<T>(int32, const T*, T*, T, int32, int32, int32);
 NAX_SORTING_FOR_EACH_TYPE(NAX_SORTING_DECLARE)
 #undef NAX_SORTING_DECLARE
+extern template void naxSort2DVectors<float>(int32, int32, const CNaxVector2<float>*,
+                                             CNaxVector2<float>*, float, int32, int32);
+extern template void naxSort2DVectors<double>(int32, int32, const CNaxVector2<double>*,
+                                              CNaxVector2<double>*, double, int32, int32);
 
 #endif  // NAX_SORTING_H

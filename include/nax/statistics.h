@@ -16,6 +16,7 @@
 #include "nax/scalar.h"
 #include "nax/sorting.h"
 #include "nax/types.h"
+#include "nax/vector2.h"
 
 /// Confidence level of an interval; any value other than 0, 1 and 3 acts as 99 %.
 enum naxProbability {
@@ -212,6 +213,15 @@ void naxGetPointsOnNormalCurveGivenEdges(T low, T high, int32 size, T* values) {
                                  [values](int32 k, T, T value) { values[k] = value; });
 }
 
+/// The same points as (x, value) pairs.
+template <typename T>
+void naxGetPointsOnNormalCurveGivenEdges(T low, T high, int32 size, CNaxVector2<T>* points) {
+  nax::detail::NormalCurvePoints(low, high, size, [points](int32 k, T x, T value) {
+    points[k][0] = x;
+    points[k][1] = value;
+  });
+}
+
 template <typename T, typename Emit>
 void nax::detail::NormalCurvePoints(T low, T high, int32 size, Emit emit) {
   const T step = size > 1 ? (high - low) / T(size - 1) : T(0);
@@ -387,7 +397,8 @@ void CNaxStatistics<T>::GaussFiltering(int32 window, int32 first, int32 last) co
   extern template void naxGetGaussWeights<T>(int32, T*);                             \
   extern template T naxGetPointOnNormalCurveGivenParams<T>(T, T, T);                 \
   extern template T naxGetPointOnNormalCurveGivenEdges<T>(T, T, T);                  \
-  extern template void naxGetPointsOnNormalCurveGivenEdges<T>(T, T, int32, T*);
+  extern template void naxGetPointsOnNormalCurveGivenEdges<T>(T, T, int32, T*);           \
+  extern template void naxGetPointsOnNormalCurveGivenEdges<T>(T, T, int32, CNaxVector2<T>*);
 NAX_STATISTICS_DECLARE(float)
 NAX_STATISTICS_DECLARE(double)
 #undef NAX_STATISTICS_DECLARE

@@ -268,3 +268,29 @@ TEST(Sorting, Sort2DArrayMatchesLexicographicOrderOnIntegers) {
 }
 
 }  // namespace
+
+namespace {
+
+TEST(Sort2DVectors, MatchesTheInterleavedForm) {
+  std::mt19937 rng(11);
+  std::uniform_int_distribution<int> u(-4, 4);
+  const int32 n = 200;
+  std::vector<double> flat(2 * n), flatOut(2 * n);
+  std::vector<CNaxVector2<double>> vectors(n), vectorsOut(n);
+  for (int32 k = 0; k < n; ++k) {
+    flat[2 * k] = u(rng);
+    flat[2 * k + 1] = u(rng) * 0.5;
+    vectors[k][0] = flat[2 * k];
+    vectors[k][1] = flat[2 * k + 1];
+  }
+  for (int32 byFirst : {0, 1}) {
+    naxSort2DArray(n, flat.data(), flatOut.data(), 0.0, 1, 0, byFirst);
+    naxSort2DVectors(n, byFirst, vectors.data(), vectorsOut.data(), 0.0, 1, 0);
+    for (int32 k = 0; k < n; ++k) {
+      EXPECT_EQ(vectorsOut[k][0], flatOut[2 * k]);
+      EXPECT_EQ(vectorsOut[k][1], flatOut[2 * k + 1]);
+    }
+  }
+}
+
+}  // namespace

@@ -287,3 +287,18 @@ TYPED_TEST(StatisticsTest, RangeFiltersSeeOnlyTheirRange) {
 }
 
 }  // namespace
+
+namespace {
+
+TEST(NormalCurvePoints, VectorFormPairsPositionsWithValues) {
+  double values[7];
+  CNaxVector2<double> points[7];
+  naxGetPointsOnNormalCurveGivenEdges(-3.0, 3.0, 7, values);
+  naxGetPointsOnNormalCurveGivenEdges(-3.0, 3.0, 7, points);
+  for (int32 k = 0; k < 7; ++k) {
+    EXPECT_DOUBLE_EQ(points[k][0], -3.0 + k);
+    EXPECT_EQ(points[k][1], values[k]);
+  }
+}
+
+}  // namespace
