@@ -8,6 +8,10 @@
 // Ownership: a node owns its data, its sub-channel records and the trees below them; the
 // filter is not owned and must outlive the channel. FWT, FWTStep, IFWT and DestroyingIFWT
 // consume a raw (respectively decomposed) channel and return a new tree owned by the caller.
+//
+// Noise reduction and enhancement of the high bands, and the editing routines (windows,
+// packing, rescaling), are defined in nax/detail/wavelet_denoise.h and
+// nax/detail/wavelet_edit.h.
 #ifndef NAX_CHANNEL_H
 #define NAX_CHANNEL_H
 
@@ -27,6 +31,44 @@ enum naxSubChannelType : int32 {
   naxSubChannelLH = 2,   ///< high along X, low along Y
   naxSubChannelHL = 3    ///< low along X, high along Y
 };
+
+/// How the thresholds of noise reduction are found. Sigma is the noise estimate of the
+/// finest band, N the channel's sample count, d its depth, n a band's sample count.
+enum naxWaveletDenoising : int32 {
+  /// The caller's threshold on the first level, times the caller's ratio on each further one.
+  naxDenoisingByGivenThresholds = 0,
+  /// sigma * sqrt(2 ln N) on all levels.
+  naxDenoisingUniversal = 1,
+  /// sigma * sqrt(2 ln N) / sqrt(2^(d-1)) on the first level, times sqrt(2) per level.
+  naxDenoisingUniversalByLevels = 2,
+  /// Per band: sqrt(ln(n/d)) * sigma^2 / sqrt(V), V the band's variance.
+  naxDenoisingByBandDeviation = 3,
+  /// Per band: sqrt(ln(n/d)) * sigma^2 / sqrt(V - sigma^2).
+  naxDenoisingByBandSignal = 4,
+  /// As 4, keeping small coefficients that stand beside a large one.
+  naxDenoisingByBandSignalAndNeighbours = 5
+};
+
+template <typename T>
+class CNaxWaveletDecomposition;
+
+/// Copies a packed `width` by `height` block into `destination`, an array of `cols`
+/// columns, with its top-left corner at (left, top). Nothing for a height under 1.
+template <typename T>
+void naxInsertRectData(const T* source, T* destination, int32 cols, int32 left, int32 top,
+                       int32 width, int32 height);
+/// Copies the `width` by `height` block at (left, top) of `source`, an array of `cols`
+/// columns, into the packed array `destination`. Nothing for a height under 1.
+template <typename T>
+void naxExtractRectData(const T* source, int32 cols, int32 left, int32 top, int32 width,
+                        int32 height, T* destination);
+/// Copies a `width` by `height` block from (sourceLeft, sourceTop) of `source`, of
+/// `sourceCols` columns, to (destinationLeft, destinationTop) of `destination`, of
+/// `destinationCols` columns. Nothing for a width or height under 1.
+template <typename T>
+void naxInsertPartRectData(const T* source, T* destination, int32 sourceCols, int32 sourceLeft,
+                           int32 sourceTop, int32 destinationCols, int32 destinationLeft,
+                           int32 destinationTop, int32 width, int32 height);
 
 /// A two-dimensional array of samples and, once transformed, the tree of its sub-channels.
 template <typename T>
@@ -190,7 +232,170 @@ class CNaxChannel {
   /// Destroys sub-channel 0 of this node; its record stays.
   void DestroyLowestSubChannel();
 
+  // -------------------------------------------------------------------------------------
+  // Noise reduction and enhancement of the high bands
+
+  /// Noise deviation: median of the absolute values of the finest high band (sub-channel
+  /// 1 of this node) over 0.6745; 0 for a raw channel.
+  T EstimateNoise() const;
+  /// Thresholds s^2 / sqrt(V - s^2) averaged over the high bands of the first level into
+  /// `first` (1e6 for a band whose variance V hardly exceeds the noise s^2), and the ratio
+  /// of the second level's average to the first's into `ratio` (0 for depth 1 or a raw
+  /// channel).
+  void EstimateThreshold(T& first, T& ratio) const;
+  /// Largest of the signed sample `index` and the absolute values of its neighbours above,
+  /// left, right and below-right (the mask of the neighbour-aware shrinkage).
+  T GetAbsMaxInMask(const T* data, int32 index, int32 cols, int32 rows) const;
+  /// Cleaned clone (owned by the caller): coefficients with |c| <= t vanish, t being
+  /// `threshold` on the top level and `threshold` * `ratio` on all deeper ones; with `soft`
+  /// non-zero the others shrink by t toward 0. Bands with t <= 1e-6 stay. Null when raw.
+  CNaxChannel<T>* CleanDirectly(T threshold, T ratio, int32 soft) const;
+  /// Cleaned clone (owned by the caller) with the thresholds of `method`; `first` and
+  /// `ratio` carry the given thresholds in (method 0) and report the first level's
+  /// threshold and the ratio between levels. Null for a raw channel.
+  CNaxChannel<T>* CleanBelowThreshold(T& first, T& ratio, int32 soft,
+                                      naxWaveletDenoising method) const;
+  /// Translation-invariant denoising of a raw channel: the average of CleanBelowThreshold
+  /// over the unshifted and `shifts` randomly circularly shifted two-dimensional
+  /// transforms of `depth` levels. Returns a raw channel (owned by the caller) and the
+  /// averaged thresholds.
+  CNaxChannel<T>* CleanWithCircularShifts(T& first, T& ratio, int32 shifts,
+                                          CNaxWaveletFilter<T>* filter, int32 depth,
+                                          int32 soft, naxWaveletDenoising method) const;
+  /// This channel becomes a raw copy of `channel` with element (x, y) taken from
+  /// ((x + shiftX) mod cols, (y + shiftY) mod rows).
+  void CopyDataWithShifts(const CNaxChannel<T>* channel, int32 shiftY, int32 shiftX);
+  /// Multiplies the high bands by `factor` on the top level, and by factors halved (or
+  /// doubled, for a factor under 1) toward 1 on the deeper levels while they stay away
+  /// from 1.
+  void Enhance(T factor);
+  /// Multiplies the high bands of `level` (1 is the top) by `factor`.
+  void EnhanceHRLevel(T factor, int32 level);
+  /// Multiplies band `index` of `level` (1 is the top) by `factor`.
+  void EnhanceSubLevel(T factor, int32 level, int32 index);
+  /// Multiplies the samples of this node by `factor`.
+  void EnhanceRawData(T factor);
+  /// Multiplies the high bands of level k (0 the top) by factors[k] and the lowest low
+  /// band by factors[depth].
+  void EditByLevels(const T* factors);
+  /// Blends band by band: weights[k] * this + (1 - weights[k]) * other on level k, the
+  /// lowest low band with weights[depth]. The result goes into `result` (emptied first)
+  /// or, when it is null, into a new channel owned by the caller; returns it.
+  CNaxChannel<T>* MixByLevels(const CNaxChannel<T>* other, const T* weights,
+                              CNaxChannel<T>* result) const;
+  /// a * this + b * other, sample by sample or band by band; the deeper tree is first
+  /// reconstructed down to the common depth. The result goes into `result` (emptied
+  /// first) or, when it is null, into a new channel owned by the caller; returns it.
+  CNaxChannel<T>* Combine(const CNaxChannel<T>* other, T a, T b, CNaxChannel<T>* result) const;
+
+  // -------------------------------------------------------------------------------------
+  // Editing: windows, packing and rescaling
+
+  /// Window [left, right] x [top, bottom] (absolute, inclusive) as a new channel owned by
+  /// the caller. Of a decomposed channel the result is a tree widened by the coefficients
+  /// that the window's samples depend on, so that its inverse reproduces the window's
+  /// samples. Null when the window is not inside the channel.
+  CNaxChannel<T>* Cut(int32 left, int32 top, int32 right, int32 bottom) const;
+  /// Writes `channel` (raw or decomposed, of the same kind) into this one at its offsets;
+  /// parts outside this channel are left out.
+  void Paste(const CNaxChannel<T>* channel);
+  /// Samples [left, left + width) x [top, top + height) (absolute) of the reconstruction,
+  /// computed from the coefficients of that window only; owned by the caller, null when
+  /// this channel is raw or the window is not inside it. This tree stays intact.
+  CNaxChannel<T>* IFWT(int32 left, int32 top, int32 width, int32 height) const;
+  /// Cuts from the tree `channel`, of type 1, the coefficients of the window [left, right]
+  /// x [top, bottom] (absolute, with the filter's margin) and pastes them into this tree
+  /// of the same type moved by (dx, dy), level by level, so that this tree's inverse there
+  /// shows the window. Returns this channel; null, with nothing changed, when the types
+  /// differ, the window is not inside `channel` or a move along the split axis is not a
+  /// multiple of 2^depth (the parities of a level would change).
+  CNaxChannel<T>* CutAndPasteRows(const CNaxChannel<T>* channel, int32 left, int32 top,
+                                  int32 right, int32 bottom, int32 dx, int32 dy);
+  /// The same for trees of type 2.
+  CNaxChannel<T>* CutAndPasteColumns(const CNaxChannel<T>* channel, int32 left, int32 top,
+                                     int32 right, int32 bottom, int32 dx, int32 dy);
+  /// The same for two-dimensional trees (and trees of any one type), with the margins
+  /// along X and Y given in coefficients instead of the filter's.
+  CNaxChannel<T>* CutAndPaste2D(const CNaxChannel<T>* channel, int32 left, int32 top,
+                                int32 right, int32 bottom, int32 dx, int32 dy, int32 marginX,
+                                int32 marginY);
+  /// All bands in one raw channel of this shape: the lowest low band top left, each
+  /// level's high bands right of and below its low band. Null for a raw channel.
+  CNaxChannel<T>* PackDecomposedChannel() const;
+  /// Reverse of PackDecomposedChannel on a raw channel: a tree of `depth` levels (fewer
+  /// when the shape stops the split), owned by the caller.
+  CNaxChannel<T>* UnpackDecomposedChannel(CNaxWaveletFilter<T>* filter, naxChannelType type,
+                                          int32 depth, naxWaveletNormalization normalization) const;
+  /// Lowest low band resampled to this channel's shape; null for a raw channel.
+  CNaxChannel<T>* GetScaledLowChannel() const;
+  /// Band `type` of `level` (1 is the top) resampled to this channel's shape; null when
+  /// there is no such raw band.
+  CNaxChannel<T>* GetScaledHighChannel(int32 level, naxSubChannelType type) const;
+  /// One two-dimensional level of twice this raw channel's shape and offsets: the samples
+  /// as its low band, zero high bands. Its inverse is the doubled signal.
+  CNaxChannel<T>* ScaleRawChannelTwiceUp(CNaxWaveletFilter<T>* filter) const;
+  /// Low band of one two-dimensional step of a copy: the raw channel at half size.
+  CNaxChannel<T>* ScaleRawChannelTwiceDown(CNaxWaveletFilter<T>* filter) const;
+  /// This tree under a new top level of zero high bands, of twice the shape and offsets.
+  CNaxChannel<T>* ScaleDecomposedChannelTwiceUp() const;
+  /// Decomposition of the half-size signal with this depth where the shape allows it
+  /// (two-dimensional trees only; null otherwise).
+  CNaxChannel<T>* ScaleDecomposedChannelTwiceDown() const;
+  /// Raw channel rescaled by `factor` (1/32 to 32): wavelet doubling or halving to the
+  /// nearest power of two, then bilinear resizing to the truncated size. Null outside
+  /// the range, for a result under 3 samples a side, or for a decomposed channel.
+  CNaxChannel<T>* Scale(T factor, CNaxWaveletFilter<T>* filter) const;
+  /// Raw channel resampled bilinearly to cols by rows (exact doubling and halving by
+  /// repetition and averaging); null for a decomposed channel or an empty shape.
+  CNaxChannel<T>* Resize(int32 cols, int32 rows) const;
+
  private:
+  template <typename U>
+  friend class CNaxWaveletDecomposition;
+
+  CNaxChannel<T>* CutFromRawChannel(int32 left, int32 top, int32 right, int32 bottom) const;
+  CNaxChannel<T>* CutFromDecomposedChannel(int32 left, int32 top, int32 right, int32 bottom,
+                                           CNaxChannel<T>* a, CNaxChannel<T>* b,
+                                           CNaxChannel<T>* c, CNaxChannel<T>* d) const;
+  CNaxChannel<T>* CutRectForRows(int32 left, int32 top, int32 right, int32 bottom,
+                                 CNaxChannel<T>* a, CNaxChannel<T>* b, CNaxChannel<T>* c,
+                                 CNaxChannel<T>* d, int32 margin) const;
+  CNaxChannel<T>* CutRectForColumns(int32 left, int32 top, int32 right, int32 bottom,
+                                    CNaxChannel<T>* a, CNaxChannel<T>* b, CNaxChannel<T>* c,
+                                    CNaxChannel<T>* d, int32 margin) const;
+  CNaxChannel<T>* CutRectFor2D(int32 left, int32 top, int32 right, int32 bottom,
+                               CNaxChannel<T>* a, CNaxChannel<T>* b, CNaxChannel<T>* c,
+                               CNaxChannel<T>* d, int32 margin) const;
+  CNaxChannel<T>* CutRect(int32 left, int32 top, int32 right, int32 bottom,
+                          CNaxChannel<T>* const records[4], int32 marginX, int32 marginY) const;
+  void CutTree(const nax::detail::Span1D extent[2], CNaxChannel<T>* const records[4],
+               CNaxChannel<T>* node) const;
+  bool WindowInside(int32 left, int32 top, int32 right, int32 bottom) const;
+  void PasteRawChannel(const CNaxChannel<T>* channel);
+  void PasteSamples(const CNaxChannel<T>* channel, int32 margin);
+  void PasteDecomposedChannel(const CNaxChannel<T>* channel, CNaxChannel<T>* a,
+                              CNaxChannel<T>* b, CNaxChannel<T>* c, CNaxChannel<T>* d);
+  void PasteRectForRows(const CNaxChannel<T>* channel, CNaxChannel<T>* a, CNaxChannel<T>* b,
+                        CNaxChannel<T>* c, CNaxChannel<T>* d, int32 margin);
+  void PasteRectForColumns(const CNaxChannel<T>* channel, CNaxChannel<T>* a, CNaxChannel<T>* b,
+                           CNaxChannel<T>* c, CNaxChannel<T>* d, int32 margin);
+  void PasteRectFor2D(const CNaxChannel<T>* channel, CNaxChannel<T>* a, CNaxChannel<T>* b,
+                      CNaxChannel<T>* c, CNaxChannel<T>* d, int32 margin);
+  void PasteBands(const CNaxChannel<T>* const bands[4], int32 count, int32 margin);
+  bool ShiftTree(int32 dx, int32 dy);
+  CNaxChannel<T>* ResampledCopy(const CNaxChannel<T>* band, int32 cols, int32 rows) const;
+  int32 FilterMargin() const;
+  void PackInto(T* packed, int32 packedCols) const;
+  void UnpackFrom(const T* packed, int32 packedCols);
+  void ShrinkBand(const CNaxChannel<T>* original, T t, int32 soft, naxWaveletDenoising method);
+  void ScaleHighBands(T factor);
+  CNaxChannel<T>* NodeAtLevel(int32 level) const;
+  CNaxChannel<T>* ReducedTo(int32 depth) const;
+  static void CombineSamples(const CNaxChannel<T>* x, const CNaxChannel<T>* y, T a, T b,
+                             CNaxChannel<T>* result);
+  static CNaxChannel<T>* DenoisedPass(CNaxChannel<T>* work, T& first, T& ratio,
+                                      CNaxWaveletFilter<T>* filter, int32 depth, int32 soft,
+                                      naxWaveletDenoising method);
   static constexpr int32 kMaxSubChannels = 4;
   struct LiftStep {
     int32 taps;
@@ -1190,11 +1395,26 @@ void CNaxChannel<T>::Print() const {
   os.flush();
 }
 
+#include "nax/detail/wavelet_denoise.h"
+#include "nax/detail/wavelet_edit.h"
+
 extern template class CNaxChannel<float>;
 extern template class CNaxChannel<double>;
 extern template int32 naxAreChannelsAlmostEqual<float>(const CNaxChannel<float>*,
                                                        const CNaxChannel<float>*, float);
 extern template int32 naxAreChannelsAlmostEqual<double>(const CNaxChannel<double>*,
                                                         const CNaxChannel<double>*, double);
+extern template void naxInsertRectData<float>(const float*, float*, int32, int32, int32, int32,
+                                              int32);
+extern template void naxInsertRectData<double>(const double*, double*, int32, int32, int32,
+                                               int32, int32);
+extern template void naxExtractRectData<float>(const float*, int32, int32, int32, int32, int32,
+                                               float*);
+extern template void naxExtractRectData<double>(const double*, int32, int32, int32, int32,
+                                                int32, double*);
+extern template void naxInsertPartRectData<float>(const float*, float*, int32, int32, int32,
+                                                  int32, int32, int32, int32, int32);
+extern template void naxInsertPartRectData<double>(const double*, double*, int32, int32, int32,
+                                                   int32, int32, int32, int32, int32);
 
 #endif  // NAX_CHANNEL_H

@@ -27,5 +27,6 @@
 #include "nax/wavelet_filter.h"
 #include "nax/lifting.h"
 #include "nax/channel.h"
+#include "nax/wavelet_decomposition.h"
 
 #endif  // NAX_NAX_H

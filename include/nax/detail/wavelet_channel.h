@@ -16,6 +16,22 @@ inline int32 HighOffset(int32 offset) { return offset / 2; }
 /// 1 when the absolute coordinate `offset + index` is odd.
 inline int32 IsOdd(int32 offset, int32 index) { return (offset + index) & 1; }
 
+/// An inclusive range of indices along one axis; empty when last < first.
+struct Span1D {
+  int32 first;
+  int32 last;
+  int32 Length() const { return last >= first ? last - first + 1 : 0; }
+};
+
+/// Indices, within the low (or high) half, of the samples first..last of a signal that
+/// starts at absolute coordinate `offset`.
+inline Span1D LowSpan(Span1D s, int32 offset) {
+  return {LowLength(s.first, offset), LowLength(s.last + 1, offset) - 1};
+}
+inline Span1D HighSpan(Span1D s, int32 offset) {
+  return {HighLength(s.first, offset), HighLength(s.last + 1, offset) - 1};
+}
+
 /// Deals the n samples of one row to its halves: the samples at even absolute positions
 /// (the first one when `firstOdd` is 0) to `low`, the others to `high`.
 template <typename T>

@@ -1,0 +1,5 @@
+// Instantiations of the multi-plane image decomposition.
+#include "nax/wavelet_decomposition.h"
+
+template class CNaxWaveletDecomposition<float>;
+template class CNaxWaveletDecomposition<double>;
