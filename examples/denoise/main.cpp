@@ -197,10 +197,7 @@ Result Denoise(int width, int height, int channels, const std::vector<float>& sa
     delete decomposed;
   }
   result.seconds = std::chrono::duration<double>(Clock::now() - start).count();
-  // The band rules add up the thresholds of the first level's bands: report their mean.
-  const bool byBands = options.method == naxDenoisingByBandDeviation || options.method == naxDenoisingByBandSignal ||
-                       options.method == naxDenoisingByBandSignalAndNeighbours;
-  result.threshold = byBands ? first[0] / 3 : first[0];
+  result.threshold = first[0];  // for the band rules, the mean over the first level's bands
   if (options.method == naxDenoisingUniversal || options.method == naxDenoisingUniversalByLevels) {
     // The universal rules don't report their threshold: it is sigma sqrt(2 ln N), divided
     // by sqrt(2^(depth - 1)) on the first level of the rule by levels.
