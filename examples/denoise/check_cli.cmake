@@ -33,6 +33,24 @@ if(NOT head STREQUAL "P5\n16 8\n255\n")
   message(FATAL_ERROR "unexpected output header '${head}'")
 endif()
 
+# PNG in and out, grey and colour, when the program is built with libpng.
+if(WITH_PNG)
+  expect_success(${DENOISE} ${input} ${WORK_DIR}/grey.png)
+  expect_success(${DENOISE} ${WORK_DIR}/grey.png ${WORK_DIR}/grey2.png --wavelet 1_1)
+  # The demo writes real RGB PNG files of its scene; denoise one of them again.
+  execute_process(COMMAND ${DENOISE} WORKING_DIRECTORY ${WORK_DIR} RESULT_VARIABLE rc OUTPUT_QUIET)
+  if(NOT rc EQUAL 0)
+    message(FATAL_ERROR "the demo failed (${rc})")
+  endif()
+  expect_success(${DENOISE} ${WORK_DIR}/scene-noisy.png ${WORK_DIR}/colour.png --wavelet 4_4 --shifts 2)
+  expect_success(${DENOISE} ${WORK_DIR}/colour.png ${WORK_DIR}/colour.ppm --method band-signal)
+  file(READ ${WORK_DIR}/colour.png magic LIMIT 4 HEX)
+  file(READ ${WORK_DIR}/colour.ppm head LIMIT 2)
+  if(NOT magic STREQUAL "89504e47" OR NOT head MATCHES "^P6")
+    message(FATAL_ERROR "the colour outputs are not a PNG and a PPM file")
+  endif()
+endif()
+
 # Refusals: an unsupported file and overwriting the input.
 file(WRITE ${WORK_DIR}/text.pgm "hello")
 execute_process(COMMAND ${DENOISE} ${WORK_DIR}/text.pgm ${WORK_DIR}/x.pgm RESULT_VARIABLE rc ERROR_VARIABLE err)
