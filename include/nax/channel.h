@@ -381,6 +381,8 @@ class CNaxChannel {
                            CNaxChannel<T>* c, CNaxChannel<T>* d, int32 margin);
   void PasteRectFor2D(const CNaxChannel<T>* channel, CNaxChannel<T>* a, CNaxChannel<T>* b,
                       CNaxChannel<T>* c, CNaxChannel<T>* d, int32 margin);
+  void PasteRectOfType(naxChannelType type, const CNaxChannel<T>* channel, CNaxChannel<T>* a,
+                       CNaxChannel<T>* b, CNaxChannel<T>* c, CNaxChannel<T>* d, int32 margin);
   void PasteBands(const CNaxChannel<T>* const bands[4], int32 count, int32 margin);
   bool ShiftTree(int32 dx, int32 dy);
   CNaxChannel<T>* ResampledCopy(const CNaxChannel<T>* band, int32 cols, int32 rows) const;
@@ -411,6 +413,10 @@ class CNaxChannel {
   void ReleaseStorage();
   void CopyFrom(const CNaxChannel<T>* channel, bool tree);
   void TakeOver(CNaxChannel<T>* channel);
+  void CopyGeometry(const CNaxChannel<T>* channel);
+  void CopySettings(const CNaxChannel<T>* channel);
+  CNaxChannel<T>* NewBand(int32 cols, int32 rows, int32 offsetX, int32 offsetY, bool zero) const;
+  bool StartSubChannelsLike(const CNaxChannel<T>* channel);
   void BuildSubChannels(CNaxWaveletFilter<T>* filter, naxChannelType type,
                         naxWaveletNormalization normalization, bool zero);
   bool FilterTypeDiffers(const CNaxWaveletFilter<T>* filter) const;
@@ -433,6 +439,14 @@ class CNaxChannel {
                  bool inverse) const;
   void AdvancePipe(VerticalPipe& pipe, const CNaxLifting<T>& record) const;
   static int32 FinalRows(const VerticalPipe& pipe, int32 channel);
+  // The lifting records and vertical pipes of one level, shared by the two one-pass routines.
+  struct LiftPlan {
+    bool twoD, columnsOnly, vertical;
+    CNaxLifting<T> evenY, oddY;  // along X, for the rows of even and of odd Y
+    CNaxLifting<T> pairA, pairB;  // vertical pairs: (0, 3) and (2, 1) in 2D, (0, 1) along columns
+    VerticalPipe pipeA, pipeB;
+  };
+  LiftPlan MakeLiftPlan(bool inverse) const;
   void SplitAndLift(const CNaxChannel<T>* raw);
   void LiftAndUnite(CNaxChannel<T>* raw) const;
   CNaxChannel<T>* InverseOneLevel();
@@ -625,14 +639,8 @@ void CNaxChannel<T>::BuildSubChannels(CNaxWaveletFilter<T>* filter, naxChannelTy
                              {highCols, highRows, highX, highY},
                              {highCols, lowRows, highX, lowY},
                              {lowCols, highRows, lowX, highY}};
-  for (int32 k = 0; k < m_subChannelsNb; ++k) {
-    auto* sub = new CNaxChannel<T>(shape[k][0], shape[k][1], shape[k][2], shape[k][3]);
-    sub->m_data = NewSamples(sub->Size(), zero);
-    sub->m_filter = filter;
-    sub->m_type = type;
-    sub->m_normalization = normalization;
-    m_subChannels[k] = sub;
-  }
+  for (int32 k = 0; k < m_subChannelsNb; ++k)
+    m_subChannels[k] = NewBand(shape[k][0], shape[k][1], shape[k][2], shape[k][3], zero);
   m_decomposed = 1;
 }
 
@@ -642,52 +650,68 @@ void CNaxChannel<T>::CreateOneLevelSubChannels(CNaxWaveletFilter<T>* filter, nax
   BuildSubChannels(filter, type, normalization, true);
 }
 
+// A band of the given shape and this node's settings; its samples are zeroed when `zero`.
 template <typename T>
-void CNaxChannel<T>::CreateOneLevelSubChannels(const CNaxChannel<T>* channel) {
-  ReleaseStorage();
+CNaxChannel<T>* CNaxChannel<T>::NewBand(int32 cols, int32 rows, int32 offsetX, int32 offsetY,
+                                        bool zero) const {
+  auto* sub = new CNaxChannel<T>(cols, rows, offsetX, offsetY);
+  sub->m_data = NewSamples(sub->Size(), zero);
+  sub->m_filter = m_filter;
+  sub->m_type = m_type;
+  sub->m_normalization = m_normalization;
+  return sub;
+}
+
+template <typename T>
+void CNaxChannel<T>::CopyGeometry(const CNaxChannel<T>* channel) {
+  m_cols = channel->m_cols;
+  m_rows = channel->m_rows;
+  m_offsetX = channel->m_offsetX;
+  m_offsetY = channel->m_offsetY;
+}
+
+template <typename T>
+void CNaxChannel<T>::CopySettings(const CNaxChannel<T>* channel) {
   m_filter = channel->m_filter;
   m_type = channel->m_type;
   m_normalization = channel->m_normalization;
+}
+
+// Empties this node, takes the settings of `channel` and, when `channel` has sub-channels,
+// an empty table for as many; false when there is nothing to build.
+template <typename T>
+bool CNaxChannel<T>::StartSubChannelsLike(const CNaxChannel<T>* channel) {
+  ReleaseStorage();
+  CopySettings(channel);
   m_decomposed = 0;
-  if (channel->m_subChannels == nullptr || channel->m_subChannelsNb < 1) return;
+  if (channel->m_subChannels == nullptr || channel->m_subChannelsNb < 1) return false;
   m_subChannels = new CNaxChannel<T>*[kMaxSubChannels]();
   m_subChannelsNb = channel->m_subChannelsNb;
+  return true;
+}
+
+template <typename T>
+void CNaxChannel<T>::CreateOneLevelSubChannels(const CNaxChannel<T>* channel) {
+  if (!StartSubChannelsLike(channel)) return;
   for (int32 k = 0; k < kMaxSubChannels; ++k) {
     const CNaxChannel<T>* model = channel->m_subChannels[k];
-    if (model == nullptr) continue;
-    auto* sub = new CNaxChannel<T>(model->m_cols, model->m_rows, model->m_offsetX,
-                                   model->m_offsetY);
-    sub->m_data = NewSamples(sub->Size(), true);
-    sub->m_filter = m_filter;
-    sub->m_type = m_type;
-    sub->m_normalization = m_normalization;
-    m_subChannels[k] = sub;
+    if (model != nullptr)
+      m_subChannels[k] =
+          NewBand(model->m_cols, model->m_rows, model->m_offsetX, model->m_offsetY, true);
   }
   m_decomposed = 1;
 }
 
 template <typename T>
 void CNaxChannel<T>::CloneOneLevelSubChannels(const CNaxChannel<T>* channel) {
-  ReleaseStorage();
-  m_filter = channel->m_filter;
-  m_type = channel->m_type;
-  m_normalization = channel->m_normalization;
-  m_decomposed = 0;
-  if (channel->m_subChannels == nullptr || channel->m_subChannelsNb < 1) return;
-  m_subChannels = new CNaxChannel<T>*[kMaxSubChannels]();
-  m_subChannelsNb = channel->m_subChannelsNb;
+  if (!StartSubChannelsLike(channel)) return;
   for (int32 k = 0; k < kMaxSubChannels; ++k) {
     const CNaxChannel<T>* model = channel->m_subChannels[k];
     if (model == nullptr) continue;
     auto* sub = new CNaxChannel<T>();
     if (k == 0) {  // the low band is filled by the next level of the clone
-      sub->m_cols = model->m_cols;
-      sub->m_rows = model->m_rows;
-      sub->m_offsetX = model->m_offsetX;
-      sub->m_offsetY = model->m_offsetY;
-      sub->m_filter = model->m_filter;
-      sub->m_type = model->m_type;
-      sub->m_normalization = model->m_normalization;
+      sub->CopyGeometry(model);
+      sub->CopySettings(model);
     } else {
       sub->CopyFrom(model, false);
     }
@@ -708,13 +732,8 @@ template <typename T>
 void CNaxChannel<T>::CopyFrom(const CNaxChannel<T>* channel, bool tree) {
   if (channel == this) return;
   ReleaseStorage();
-  m_cols = channel->m_cols;
-  m_rows = channel->m_rows;
-  m_offsetX = channel->m_offsetX;
-  m_offsetY = channel->m_offsetY;
-  m_filter = channel->m_filter;
-  m_type = channel->m_type;
-  m_normalization = channel->m_normalization;
+  CopyGeometry(channel);
+  CopySettings(channel);
   m_decomposed = tree ? channel->m_decomposed : 0;
   if (channel->m_data != nullptr) {
     m_data = NewSamples(Size(), false);
@@ -735,16 +754,11 @@ void CNaxChannel<T>::CopyFrom(const CNaxChannel<T>* channel, bool tree) {
 template <typename T>
 void CNaxChannel<T>::TakeOver(CNaxChannel<T>* channel) {
   ReleaseStorage();
-  m_cols = channel->m_cols;
-  m_rows = channel->m_rows;
-  m_offsetX = channel->m_offsetX;
-  m_offsetY = channel->m_offsetY;
+  CopyGeometry(channel);
+  CopySettings(channel);
   m_subChannelsNb = channel->m_subChannelsNb;
   m_subChannels = channel->m_subChannels;
-  m_filter = channel->m_filter;
-  m_type = channel->m_type;
   m_data = channel->m_data;
-  m_normalization = channel->m_normalization;
   m_decomposed = channel->m_decomposed;
   channel->m_subChannels = nullptr;
   channel->m_subChannelsNb = 0;
@@ -982,48 +996,56 @@ int32 CNaxChannel<T>::FinalRows(const VerticalPipe& pipe, int32 channel) {
   return rows;
 }
 
+template <typename T>
+typename CNaxChannel<T>::LiftPlan CNaxChannel<T>::MakeLiftPlan(bool inverse) const {
+  const bool twoD = m_type == naxChannel2D, vertical = m_type != naxChannelRows;
+  LiftPlan plan{twoD,
+                m_type == naxChannelColumns,
+                vertical,
+                CNaxLifting<T>(Sub(0), Sub(twoD ? 2 : 1), 1),
+                CNaxLifting<T>(twoD ? Sub(3) : Sub(0), Sub(1), 1),
+                CNaxLifting<T>(Sub(0), Sub(twoD ? 3 : 1), 0),
+                CNaxLifting<T>(twoD ? Sub(2) : Sub(0), Sub(1), 0),
+                VerticalPipe{},
+                VerticalPipe{}};
+  if (vertical) StartPipe(plan.pipeA, Sub(0), Sub(twoD ? 3 : 1), inverse);
+  if (twoD) StartPipe(plan.pipeB, Sub(2), Sub(1), inverse);
+  return plan;
+}
+
 // Split followed by the lifting, in one pass over the rows of `raw`: each row is dealt to
 // its halves and lifted along X while in cache, and the vertical steps follow a few rows
 // behind. The result equals Split and then LiftDirect on each pair.
 template <typename T>
 void CNaxChannel<T>::SplitAndLift(const CNaxChannel<T>* raw) {
   using namespace nax::detail;
-  const bool twoD = m_type == naxChannel2D, columnsOnly = m_type == naxChannelColumns;
-  const bool vertical = m_type != naxChannelRows;
-  const CNaxLifting<T> evenY(Sub(0), Sub(twoD ? 2 : 1), 1);
-  const CNaxLifting<T> oddY(twoD ? Sub(3) : Sub(0), Sub(1), 1);
-  // Vertical pairs: (0, 3) and (2, 1) in two dimensions, (0, 1) along columns.
-  const CNaxLifting<T> pairA(Sub(0), Sub(twoD ? 3 : 1), 0);
-  const CNaxLifting<T> pairB(twoD ? Sub(2) : Sub(0), Sub(1), 0);
-  VerticalPipe pipeA{}, pipeB{};
-  if (vertical) StartPipe(pipeA, Sub(0), Sub(twoD ? 3 : 1), false);
-  if (twoD) StartPipe(pipeB, Sub(2), Sub(1), false);
+  LiftPlan p = MakeLiftPlan(false);
   const int32 oddX = IsOdd(m_offsetX, 0);
   int32 next[2] = {0, 0};
   for (int32 y = 0; y < m_rows; ++y) {
     const T* src = raw->m_data + Index(0, y);
-    const int32 parity = vertical ? IsOdd(m_offsetY, y) : 0;
-    const int32 r = vertical ? next[parity]++ : y;
-    if (columnsOnly) {
+    const int32 parity = p.vertical ? IsOdd(m_offsetY, y) : 0;
+    const int32 r = p.vertical ? next[parity]++ : y;
+    if (p.columnsOnly) {
       CNaxChannel<T>* sub = Sub(parity);
       std::memcpy(sub->m_data + sub->Index(0, r), src, static_cast<size_t>(m_cols) * sizeof(T));
     } else {
       CNaxChannel<T>* low = Sub(parity ? 3 : 0);
-      CNaxChannel<T>* high = Sub(parity ? 1 : (twoD ? 2 : 1));
+      CNaxChannel<T>* high = Sub(parity ? 1 : (p.twoD ? 2 : 1));
       DealRow(src, m_cols, oddX, low->m_data + low->Index(0, r), high->m_data + high->Index(0, r));
-      LiftRow(parity ? oddY : evenY, r, false);
+      LiftRow(parity ? p.oddY : p.evenY, r, false);
     }
-    if (vertical) {
-      ++pipeA.ready[parity ? 0 : 1];
-      AdvancePipe(pipeA, pairA);
+    if (p.vertical) {
+      ++p.pipeA.ready[parity ? 0 : 1];
+      AdvancePipe(p.pipeA, p.pairA);
     }
-    if (twoD) {
-      ++pipeB.ready[parity ? 0 : 1];
-      AdvancePipe(pipeB, pairB);
+    if (p.twoD) {
+      ++p.pipeB.ready[parity ? 0 : 1];
+      AdvancePipe(p.pipeB, p.pairB);
     }
   }
-  if (vertical) AdvancePipe(pipeA, pairA);  // all rows are in: the pipe drains
-  if (twoD) AdvancePipe(pipeB, pairB);
+  if (p.vertical) AdvancePipe(p.pipeA, p.pairA);  // all rows are in: the pipe drains
+  if (p.twoD) AdvancePipe(p.pipeB, p.pairB);
 }
 
 // Inverse lifting followed by the unite, in one pass over the rows of `raw`: the vertical
@@ -1032,40 +1054,32 @@ void CNaxChannel<T>::SplitAndLift(const CNaxChannel<T>* raw) {
 template <typename T>
 void CNaxChannel<T>::LiftAndUnite(CNaxChannel<T>* raw) const {
   using namespace nax::detail;
-  const bool twoD = m_type == naxChannel2D, columnsOnly = m_type == naxChannelColumns;
-  const bool vertical = m_type != naxChannelRows;
-  const CNaxLifting<T> evenY(Sub(0), Sub(twoD ? 2 : 1), 1);
-  const CNaxLifting<T> oddY(twoD ? Sub(3) : Sub(0), Sub(1), 1);
-  const CNaxLifting<T> pairA(Sub(0), Sub(twoD ? 3 : 1), 0);
-  const CNaxLifting<T> pairB(twoD ? Sub(2) : Sub(0), Sub(1), 0);
-  VerticalPipe pipeA{}, pipeB{};
-  if (vertical) StartPipe(pipeA, Sub(0), Sub(twoD ? 3 : 1), true);
-  if (twoD) StartPipe(pipeB, Sub(2), Sub(1), true);
+  LiftPlan p = MakeLiftPlan(true);
   constexpr int32 kChunk = 32;
   const int32 oddX = IsOdd(m_offsetX, 0);
   int32 next[2] = {0, 0};
   for (int32 y = 0; y < m_rows; ++y) {
     T* dst = raw->m_data + Index(0, y);
-    const int32 parity = vertical ? IsOdd(m_offsetY, y) : 0;
-    const int32 r = vertical ? next[parity]++ : y;
+    const int32 parity = p.vertical ? IsOdd(m_offsetY, y) : 0;
+    const int32 r = p.vertical ? next[parity]++ : y;
     const int32 channel = parity ? 0 : 1;  // high or low rows of the vertical pairs
-    if (vertical)
-      while (FinalRows(pipeA, channel) <= r) {
-        pipeA.limit += kChunk;
-        AdvancePipe(pipeA, pairA);
+    if (p.vertical)
+      while (FinalRows(p.pipeA, channel) <= r) {
+        p.pipeA.limit += kChunk;
+        AdvancePipe(p.pipeA, p.pairA);
       }
-    if (twoD)
-      while (FinalRows(pipeB, channel) <= r) {
-        pipeB.limit += kChunk;
-        AdvancePipe(pipeB, pairB);
+    if (p.twoD)
+      while (FinalRows(p.pipeB, channel) <= r) {
+        p.pipeB.limit += kChunk;
+        AdvancePipe(p.pipeB, p.pairB);
       }
-    if (columnsOnly) {
+    if (p.columnsOnly) {
       const CNaxChannel<T>* sub = Sub(parity);
       std::memcpy(dst, sub->m_data + sub->Index(0, r), static_cast<size_t>(m_cols) * sizeof(T));
     } else {
       const CNaxChannel<T>* low = Sub(parity ? 3 : 0);
-      const CNaxChannel<T>* high = Sub(parity ? 1 : (twoD ? 2 : 1));
-      LiftRow(parity ? oddY : evenY, r, true);
+      const CNaxChannel<T>* high = Sub(parity ? 1 : (p.twoD ? 2 : 1));
+      LiftRow(parity ? p.oddY : p.evenY, r, true);
       MergeRow(dst, m_cols, oddX, low->m_data + low->Index(0, r), high->m_data + high->Index(0, r));
     }
   }

@@ -10,6 +10,7 @@
 #include "nax/complex.h"
 #include "nax/detail/fixed_common.h"
 #include "nax/detail/fixed_linalg.h"
+#include "nax/detail/fixed_ops.h"
 #include "nax/vector2.h"
 
 template <typename T>
@@ -51,33 +52,33 @@ class CNaxMatrix2 {
   void SetElement(int32 row, int32 col, T value) { a[row * 2 + col] = value; }
   void AddToElement(int32 row, int32 col, T value) { a[row * 2 + col] += value; }
   void MulElement(int32 row, int32 col, T value) { a[row * 2 + col] *= value; }
-  void SetRow(int32 row, const T* source) { a[row * 2] = source[0], a[row * 2 + 1] = source[1]; }
-  void SetColumn(int32 col, const T* source) { a[col] = source[0], a[2 + col] = source[1]; }
-  void Row(int32 row, T* target) const { target[0] = a[row * 2], target[1] = a[row * 2 + 1]; }
-  void Column(int32 col, T* target) const { target[0] = a[col], target[1] = a[2 + col]; }
+  void SetRow(int32 row, const T* source) { nax::detail::SetRow<2>(a, row, source); }
+  void SetColumn(int32 col, const T* source) { nax::detail::SetColumn<2>(a, col, source); }
+  void Row(int32 row, T* target) const { nax::detail::GetRow<2>(a, row, target); }
+  void Column(int32 col, T* target) const { nax::detail::GetColumn<2>(a, col, target); }
   void SetRowVector(int32 row, const Vector& v) { a[row * 2] = v.x, a[row * 2 + 1] = v.y; }
   void SetColVector(int32 col, const Vector& v) { a[col] = v.x, a[2 + col] = v.y; }
   Vector RowVector(int32 row) const { return Vector(a[row * 2], a[row * 2 + 1]); }
   Vector ColVector(int32 col) const { return Vector(a[col], a[2 + col]); }
   Vector Diagonal() const { return Vector(a[0], a[3]); }
 
-  void Fill(const T* source) { a[0] = source[0], a[1] = source[1], a[2] = source[2], a[3] = source[3]; }
-  void Dump(T* target) const { target[0] = a[0], target[1] = a[1], target[2] = a[2], target[3] = a[3]; }
+  void Fill(const T* source) { nax::detail::CopyArray<4>(source, a); }
+  void Dump(T* target) const { nax::detail::CopyArray<4>(a, target); }
   void SetToZero() { SetConstant(T(0)); }
-  void SetConstant(T value) { a[0] = a[1] = a[2] = a[3] = value; }
+  void SetConstant(T value) { nax::detail::SetArray<4>(a, value); }
   /// Zeros with value on the diagonal.
-  void SetDiagonal(T value) { a[0] = a[3] = value, a[1] = a[2] = T(0); }
+  void SetDiagonal(T value) { nax::detail::SetDiagonal<2>(a, value); }
   /// The identity.
   void Unit() { SetDiagonal(T(1)); }
-  T Trace() const { return a[0] + a[3]; }
+  T Trace() const { return nax::detail::Trace<2>(a); }
 
   // ---- Element-wise arithmetic and products --------------------------------------------------
 
-  void Add(const CNaxMatrix2& m) { a[0] += m.a[0], a[1] += m.a[1], a[2] += m.a[2], a[3] += m.a[3]; }
-  void Sub(const CNaxMatrix2& m) { a[0] -= m.a[0], a[1] -= m.a[1], a[2] -= m.a[2], a[3] -= m.a[3]; }
-  void Mul(T value) { a[0] *= value, a[1] *= value, a[2] *= value, a[3] *= value; }
+  void Add(const CNaxMatrix2& m) { nax::detail::AddArray<4>(a, m.a); }
+  void Sub(const CNaxMatrix2& m) { nax::detail::SubArray<4>(a, m.a); }
+  void Mul(T value) { nax::detail::MulArray<4>(a, value); }
   /// Divides by value, unguarded.
-  void Div(T value) { a[0] /= value, a[1] /= value, a[2] /= value, a[3] /= value; }
+  void Div(T value) { nax::detail::DivArray<4>(a, value); }
   CNaxMatrix2& operator+=(const CNaxMatrix2& m) { return Add(m), *this; }
   CNaxMatrix2& operator-=(const CNaxMatrix2& m) { return Sub(m), *this; }
   CNaxMatrix2& operator*=(T value) { return Mul(value), *this; }
@@ -88,8 +89,9 @@ class CNaxMatrix2 {
   CNaxMatrix2 operator/(T value) const { return CNaxMatrix2(*this) /= value; }
   /// Matrix product.
   CNaxMatrix2 operator*(const CNaxMatrix2& m) const {
-    return CNaxMatrix2(a[0] * m.a[0] + a[1] * m.a[2], a[0] * m.a[1] + a[1] * m.a[3], a[2] * m.a[0] + a[3] * m.a[2],
-                       a[2] * m.a[1] + a[3] * m.a[3]);
+    T out[4];  // a local array: the result may alias an operand
+    Ops::Product(a, m.a, out);
+    return CNaxMatrix2(out);
   }
   /// Product with a column vector.
   Vector operator*(const Vector& v) const { return Vector(a[0] * v.x + a[1] * v.y, a[2] * v.x + a[3] * v.y); }
@@ -140,31 +142,9 @@ class CNaxMatrix2 {
   /// The norm of the given kind. The max-element form deliberately multiplies by 3, the
   /// factor of the 3 x 3 matrix, not by 2; the Frobenius form is 0 below the floor 1e-6 of
   /// its sum of squares; -1 if the decomposition of the spectral form fails.
-  T Norm(naxMatrixNorm norm) const {
-    switch (norm) {
-      case naxMatrixNormOne: return nax::detail::Max2(std::fabs(a[0]) + std::fabs(a[2]), std::fabs(a[1]) + std::fabs(a[3]));
-      case naxMatrixNormInfinity:
-        return nax::detail::Max2(std::fabs(a[0]) + std::fabs(a[1]), std::fabs(a[2]) + std::fabs(a[3]));
-      case naxMatrixNormSpectral: {
-        T u[4], w[2], v[4];
-        return Ops::SVD(a, u, w, v) == 0 ? w[0] : T(-1);
-      }
-      case naxMatrixNormMaxElement: return Ops::MaxAbsElement(a) * T(3);
-      default: return Ops::NormFrobenius(a);
-    }
-  }
+  T Norm(naxMatrixNorm norm) const { return nax::detail::FixedNorm<2>(a, norm, T(3)); }
   /// Condition number in the given norm; 3.4028234663852886e38 for a singular matrix.
-  T ConditionNumber(naxMatrixNorm norm) const {
-    if (norm == naxMatrixNormSpectral) {
-      T u[4], w[2], v[4];
-      if (Ops::SVD(a, u, w, v) != 0 || w[1] < nax::detail::MatrixFloor<T>()) return nax::detail::PseudoInfinity<T>();
-      return w[0] / w[1];
-    }
-    CNaxMatrix2 inverse;
-    T condition;
-    if (Inverse(inverse, norm, nax::detail::DefaultTol<T>(), condition) != 0) return nax::detail::PseudoInfinity<T>();
-    return condition;
-  }
+  T ConditionNumber(naxMatrixNorm norm) const { return nax::detail::FixedConditionNumber<2>(*this, a, norm); }
 
   /// Inverse by the adjugate: 0, or 3 with result unchanged when tol > |det|.
   int32 Inverse(CNaxMatrix2& result, T tol) const {
@@ -177,28 +157,17 @@ class CNaxMatrix2 {
   /// Inverse with the condition number Norm(norm) of this times Norm(norm) of the inverse;
   /// on 3 the condition is 3.4028234663852886e38 and result is unchanged.
   int32 Inverse(CNaxMatrix2& result, naxMatrixNorm norm, T tol, T& condition) const {
-    if (Inverse(result, tol) != 0) {
-      condition = nax::detail::PseudoInfinity<T>();
-      return 3;
-    }
-    condition = Norm(norm) * result.Norm(norm);
-    return 0;
+    return nax::detail::InverseWithCondition(*this, result, norm, tol, condition);
   }
   /// Inverse of a diagonal matrix: 1, or 0 on refusal.
   int32 DiagInverse(CNaxMatrix2& result, T tol) const { return Ops::DiagInverse(a, result.a, tol); }
   /// Solves this x = rhs through the inverse; the status of Inverse.
   int32 SolveSystem(const Vector& rhs, Vector& solution, T tol) const {
-    CNaxMatrix2 inverse;
-    const int32 status = Inverse(inverse, tol);
-    if (status == 0) solution = inverse * rhs;
-    return status;
+    return nax::detail::SolveByInverse(*this, rhs, solution, tol);
   }
   /// SolveSystem with the condition number of the norm form of Inverse.
   int32 SolveSystem(const Vector& rhs, Vector& solution, naxMatrixNorm norm, T tol, T& condition) const {
-    CNaxMatrix2 inverse;
-    const int32 status = Inverse(inverse, norm, tol, condition);
-    if (status == 0) solution = inverse * rhs;
-    return status;
+    return nax::detail::SolveByInverse(*this, rhs, solution, norm, tol, condition);
   }
 
   // ---- Decompositions ------------------------------------------------------------------------

@@ -14,6 +14,7 @@
 #include "nax/complex.h"
 #include "nax/detail/fixed_common.h"
 #include "nax/detail/fixed_linalg.h"
+#include "nax/detail/fixed_ops.h"
 #include "nax/rotations_order.h"
 #include "nax/vector3.h"
 #include "nax/vector_routines.h"
@@ -121,10 +122,10 @@ class CNaxMatrix3 {
   void SetElement(int32 row, int32 col, T value) { a[row * 3 + col] = value; }
   void AddToElement(int32 row, int32 col, T value) { a[row * 3 + col] += value; }
   void MulElement(int32 row, int32 col, T value) { a[row * 3 + col] *= value; }
-  void SetRow(int32 row, const T* source) { a[row * 3] = source[0], a[row * 3 + 1] = source[1], a[row * 3 + 2] = source[2]; }
-  void SetColumn(int32 col, const T* source) { a[col] = source[0], a[3 + col] = source[1], a[6 + col] = source[2]; }
-  void Row(int32 row, T* target) const { target[0] = a[row * 3], target[1] = a[row * 3 + 1], target[2] = a[row * 3 + 2]; }
-  void Column(int32 col, T* target) const { target[0] = a[col], target[1] = a[3 + col], target[2] = a[6 + col]; }
+  void SetRow(int32 row, const T* source) { nax::detail::SetRow<3>(a, row, source); }
+  void SetColumn(int32 col, const T* source) { nax::detail::SetColumn<3>(a, col, source); }
+  void Row(int32 row, T* target) const { nax::detail::GetRow<3>(a, row, target); }
+  void Column(int32 col, T* target) const { nax::detail::GetColumn<3>(a, col, target); }
   void SetRowVector(int32 row, const Vector& v) { a[row * 3] = v.x, a[row * 3 + 1] = v.y, a[row * 3 + 2] = v.z; }
   void SetColVector(int32 col, const Vector& v) { a[col] = v.x, a[3 + col] = v.y, a[6 + col] = v.z; }
   Vector RowVector(int32 row) const { return Vector(a[row * 3], a[row * 3 + 1], a[row * 3 + 2]); }
@@ -134,40 +135,23 @@ class CNaxMatrix3 {
   Vector LastColumn() const { return ColVector(2); }
   Vector Diagonal() const { return Vector(a[0], a[4], a[8]); }
 
-  void Fill(const T* source) {
-    for (int32 i = 0; i < 9; ++i) a[i] = source[i];
-  }
-  void Dump(T* target) const {
-    for (int32 i = 0; i < 9; ++i) target[i] = a[i];
-  }
+  void Fill(const T* source) { nax::detail::CopyArray<9>(source, a); }
+  void Dump(T* target) const { nax::detail::CopyArray<9>(a, target); }
   void SetToZero() { SetConstant(T(0)); }
-  void SetConstant(T value) {
-    for (T& e : a) e = value;
-  }
+  void SetConstant(T value) { nax::detail::SetArray<9>(a, value); }
   /// Zeros with value on the diagonal.
-  void SetDiagonal(T value) {
-    SetToZero();
-    a[0] = a[4] = a[8] = value;
-  }
+  void SetDiagonal(T value) { nax::detail::SetDiagonal<3>(a, value); }
   /// The identity.
   void Unit() { SetDiagonal(T(1)); }
-  T Trace() const { return a[0] + a[4] + a[8]; }
+  T Trace() const { return nax::detail::Trace<3>(a); }
 
   // ---- Element-wise arithmetic and products --------------------------------------------------
 
-  void Add(const CNaxMatrix3& m) {
-    for (int32 i = 0; i < 9; ++i) a[i] += m.a[i];
-  }
-  void Sub(const CNaxMatrix3& m) {
-    for (int32 i = 0; i < 9; ++i) a[i] -= m.a[i];
-  }
-  void Mul(T value) {
-    for (T& e : a) e *= value;
-  }
+  void Add(const CNaxMatrix3& m) { nax::detail::AddArray<9>(a, m.a); }
+  void Sub(const CNaxMatrix3& m) { nax::detail::SubArray<9>(a, m.a); }
+  void Mul(T value) { nax::detail::MulArray<9>(a, value); }
   /// Divides by value, unguarded.
-  void Div(T value) {
-    for (T& e : a) e /= value;
-  }
+  void Div(T value) { nax::detail::DivArray<9>(a, value); }
   CNaxMatrix3& operator+=(const CNaxMatrix3& m) { return Add(m), *this; }
   CNaxMatrix3& operator-=(const CNaxMatrix3& m) { return Sub(m), *this; }
   CNaxMatrix3& operator*=(T value) { return Mul(value), *this; }
@@ -266,33 +250,10 @@ class CNaxMatrix3 {
   /// The norm of the given kind; the max-element form multiplies by 3, the root of 9; the
   /// Frobenius form is 0 below the floor 1e-6 of its sum of squares; -1 if the singular value
   /// decomposition of the spectral form fails.
-  T Norm(naxMatrixNorm norm) const {
-    switch (norm) {
-      case naxMatrixNormOne: return Ops::NormOne(a);
-      case naxMatrixNormInfinity: return Ops::NormInfinity(a);
-      case naxMatrixNormSpectral: {
-        T u[9], w[3], v[9];
-        return Ops::SVD(a, u, w, v) == 0 ? w[0] : T(-1);
-      }
-      case naxMatrixNormMaxElement: return Ops::MaxAbsElement(a) * T(3);
-      default: return Ops::NormFrobenius(a);
-    }
-  }
+  T Norm(naxMatrixNorm norm) const { return nax::detail::FixedNorm<3>(a, norm, T(3)); }
 
   /// Condition number in the given norm; 3.4028234663852886e38 for a singular matrix.
-  T ConditionNumber(naxMatrixNorm norm) const {
-    if (norm == naxMatrixNormSpectral) {
-      T u[9], w[3], v[9];
-      if (Ops::SVD(a, u, w, v) != 0 || w[2] < nax::detail::MatrixFloor<T>())
-        return nax::detail::PseudoInfinity<T>();
-      return w[0] / w[2];
-    }
-    CNaxMatrix3 inverse;
-    T condition;
-    if (Inverse(inverse, norm, nax::detail::DefaultTol<T>(), condition) != 0)
-      return nax::detail::PseudoInfinity<T>();
-    return condition;
-  }
+  T ConditionNumber(naxMatrixNorm norm) const { return nax::detail::FixedConditionNumber<3>(*this, a, norm); }
 
   /// Inverse by the adjugate: 0, or 3 with result unchanged when tol > |det|.
   int32 Inverse(CNaxMatrix3& result, T tol) const {
@@ -315,12 +276,7 @@ class CNaxMatrix3 {
   /// Inverse with the condition number Norm(norm) of this times Norm(norm) of the inverse;
   /// on 3 the condition is 3.4028234663852886e38 and result is unchanged.
   int32 Inverse(CNaxMatrix3& result, naxMatrixNorm norm, T tol, T& condition) const {
-    if (Inverse(result, tol) != 0) {
-      condition = nax::detail::PseudoInfinity<T>();
-      return 3;
-    }
-    condition = Norm(norm) * result.Norm(norm);
-    return 0;
+    return nax::detail::InverseWithCondition(*this, result, norm, tol, condition);
   }
   /// Inverse of a diagonal matrix: 1, or 0 when an off-diagonal |a| > tol or the product of
   /// the diagonal is below tol.
@@ -329,17 +285,11 @@ class CNaxMatrix3 {
   /// Solves this x = rhs through the inverse; the status of Inverse, solution unchanged
   /// unless 0.
   int32 SolveSystem(const Vector& rhs, Vector& solution, T tol) const {
-    CNaxMatrix3 inverse;
-    const int32 status = Inverse(inverse, tol);
-    if (status == 0) solution = inverse * rhs;
-    return status;
+    return nax::detail::SolveByInverse(*this, rhs, solution, tol);
   }
   /// SolveSystem with the condition number of the norm form of Inverse.
   int32 SolveSystem(const Vector& rhs, Vector& solution, naxMatrixNorm norm, T tol, T& condition) const {
-    CNaxMatrix3 inverse;
-    const int32 status = Inverse(inverse, norm, tol, condition);
-    if (status == 0) solution = inverse * rhs;
-    return status;
+    return nax::detail::SolveByInverse(*this, rhs, solution, norm, tol, condition);
   }
 
   // ---- Decompositions ------------------------------------------------------------------------

@@ -8,6 +8,7 @@
 
 #include "nax/detail/fixed_common.h"
 #include "nax/detail/fixed_linalg.h"
+#include "nax/detail/fixed_ops.h"
 #include "nax/vector3.h"
 #include "nax/vector4.h"
 
@@ -52,18 +53,10 @@ class CNaxMatrix4 {
   void SetElement(int32 row, int32 col, T value) { a[row * 4 + col] = value; }
   void AddToElement(int32 row, int32 col, T value) { a[row * 4 + col] += value; }
   void MulElement(int32 row, int32 col, T value) { a[row * 4 + col] *= value; }
-  void SetRow(int32 row, const T* source) {
-    for (int32 j = 0; j < 4; ++j) a[row * 4 + j] = source[j];
-  }
-  void SetColumn(int32 col, const T* source) {
-    for (int32 i = 0; i < 4; ++i) a[i * 4 + col] = source[i];
-  }
-  void Row(int32 row, T* target) const {
-    for (int32 j = 0; j < 4; ++j) target[j] = a[row * 4 + j];
-  }
-  void Column(int32 col, T* target) const {
-    for (int32 i = 0; i < 4; ++i) target[i] = a[i * 4 + col];
-  }
+  void SetRow(int32 row, const T* source) { nax::detail::SetRow<4>(a, row, source); }
+  void SetColumn(int32 col, const T* source) { nax::detail::SetColumn<4>(a, col, source); }
+  void Row(int32 row, T* target) const { nax::detail::GetRow<4>(a, row, target); }
+  void Column(int32 col, T* target) const { nax::detail::GetColumn<4>(a, col, target); }
   void SetRowVector(int32 row, const Vector& v) { a[row * 4] = v.x, a[row * 4 + 1] = v.y, a[row * 4 + 2] = v.z, a[row * 4 + 3] = v.w; }
   void SetColVector(int32 col, const Vector& v) { a[col] = v.x, a[4 + col] = v.y, a[8 + col] = v.z, a[12 + col] = v.w; }
   Vector RowVector(int32 row) const { return Vector(a + row * 4); }
@@ -77,40 +70,23 @@ class CNaxMatrix4 {
   /// The translation part of the homogeneous matrix: the first three elements of column 3.
   CNaxVector3<T> ExtractTranslation() const { return CNaxVector3<T>(a[3], a[7], a[11]); }
 
-  void Fill(const T* source) {
-    for (int32 i = 0; i < 16; ++i) a[i] = source[i];
-  }
-  void Dump(T* target) const {
-    for (int32 i = 0; i < 16; ++i) target[i] = a[i];
-  }
+  void Fill(const T* source) { nax::detail::CopyArray<16>(source, a); }
+  void Dump(T* target) const { nax::detail::CopyArray<16>(a, target); }
   void SetToZero() { SetConstant(T(0)); }
-  void SetConstant(T value) {
-    for (T& e : a) e = value;
-  }
+  void SetConstant(T value) { nax::detail::SetArray<16>(a, value); }
   /// Zeros with value on the diagonal.
-  void SetDiagonal(T value) {
-    SetToZero();
-    a[0] = a[5] = a[10] = a[15] = value;
-  }
+  void SetDiagonal(T value) { nax::detail::SetDiagonal<4>(a, value); }
   /// The identity.
   void Unit() { SetDiagonal(T(1)); }
-  T Trace() const { return a[0] + a[5] + a[10] + a[15]; }
+  T Trace() const { return nax::detail::Trace<4>(a); }
 
   // ---- Element-wise arithmetic and products --------------------------------------------------
 
-  void Add(const CNaxMatrix4& m) {
-    for (int32 i = 0; i < 16; ++i) a[i] += m.a[i];
-  }
-  void Sub(const CNaxMatrix4& m) {
-    for (int32 i = 0; i < 16; ++i) a[i] -= m.a[i];
-  }
-  void Mul(T value) {
-    for (T& e : a) e *= value;
-  }
+  void Add(const CNaxMatrix4& m) { nax::detail::AddArray<16>(a, m.a); }
+  void Sub(const CNaxMatrix4& m) { nax::detail::SubArray<16>(a, m.a); }
+  void Mul(T value) { nax::detail::MulArray<16>(a, value); }
   /// Divides by value, unguarded.
-  void Div(T value) {
-    for (T& e : a) e /= value;
-  }
+  void Div(T value) { nax::detail::DivArray<16>(a, value); }
   CNaxMatrix4& operator+=(const CNaxMatrix4& m) { return Add(m), *this; }
   CNaxMatrix4& operator-=(const CNaxMatrix4& m) { return Sub(m), *this; }
   CNaxMatrix4& operator*=(T value) { return Mul(value), *this; }
@@ -119,21 +95,17 @@ class CNaxMatrix4 {
   CNaxMatrix4 operator-(const CNaxMatrix4& m) const { return CNaxMatrix4(*this) -= m; }
   CNaxMatrix4 operator*(T value) const { return CNaxMatrix4(*this) *= value; }
   CNaxMatrix4 operator/(T value) const { return CNaxMatrix4(*this) /= value; }
-  /// Matrix product, row by row as combinations of the rows of m.
+  /// Matrix product.
   CNaxMatrix4 operator*(const CNaxMatrix4& m) const {
-    T out[16];
-    const T* b = m.a;
-    for (int32 i = 0; i < 4; ++i) {
-      const T r0 = a[i * 4], r1 = a[i * 4 + 1], r2 = a[i * 4 + 2], r3 = a[i * 4 + 3];
-      for (int32 j = 0; j < 4; ++j) out[i * 4 + j] = r0 * b[j] + r1 * b[4 + j] + r2 * b[8 + j] + r3 * b[12 + j];
-    }
+    T out[16];  // a local array: the result may alias an operand
+    Ops::Product(a, m.a, out);
     return CNaxMatrix4(out);
   }
   /// Product with a column vector.
   Vector operator*(const Vector& v) const {
-    const T x = v.x, y = v.y, z = v.z, w = v.w;
+    const T in[4] = {v.x, v.y, v.z, v.w};
     T out[4];
-    for (int32 i = 0; i < 4; ++i) out[i] = a[i * 4] * x + a[i * 4 + 1] * y + a[i * 4 + 2] * z + a[i * 4 + 3] * w;
+    nax::detail::ProductVector<4>(a, in, out);
     return Vector(out);
   }
   /// this = this * m.
@@ -199,30 +171,9 @@ class CNaxMatrix4 {
   /// The norm of the given kind; the max-element form multiplies by 4, the root of 16; the
   /// Frobenius form is 0 below the floor 1e-6 of its sum of squares; -1 if the decomposition
   /// of the spectral form fails.
-  T Norm(naxMatrixNorm norm) const {
-    switch (norm) {
-      case naxMatrixNormOne: return Ops::NormOne(a);
-      case naxMatrixNormInfinity: return Ops::NormInfinity(a);
-      case naxMatrixNormSpectral: {
-        T u[16], w[4], v[16];
-        return Ops::SVD(a, u, w, v) == 0 ? w[0] : T(-1);
-      }
-      case naxMatrixNormMaxElement: return Ops::MaxAbsElement(a) * T(4);
-      default: return Ops::NormFrobenius(a);
-    }
-  }
+  T Norm(naxMatrixNorm norm) const { return nax::detail::FixedNorm<4>(a, norm, T(4)); }
   /// Condition number in the given norm; 3.4028234663852886e38 for a singular matrix.
-  T ConditionNumber(naxMatrixNorm norm) const {
-    if (norm == naxMatrixNormSpectral) {
-      T u[16], w[4], v[16];
-      if (Ops::SVD(a, u, w, v) != 0 || w[3] < nax::detail::MatrixFloor<T>()) return nax::detail::PseudoInfinity<T>();
-      return w[0] / w[3];
-    }
-    CNaxMatrix4 inverse;
-    T condition;
-    if (Inverse(inverse, norm, nax::detail::DefaultTol<T>(), condition) != 0) return nax::detail::PseudoInfinity<T>();
-    return condition;
-  }
+  T ConditionNumber(naxMatrixNorm norm) const { return nax::detail::FixedConditionNumber<4>(*this, a, norm); }
 
   /// Inverse by the adjugate: 0, or 3 with result unchanged when tol > |det|.
   int32 Inverse(CNaxMatrix4& result, T tol) const {
@@ -254,30 +205,17 @@ class CNaxMatrix4 {
   /// Inverse with the condition number Norm(norm) of this times Norm(norm) of the inverse;
   /// on 3 the condition is 3.4028234663852886e38 and result is unchanged.
   int32 Inverse(CNaxMatrix4& result, naxMatrixNorm norm, T tol, T& condition) const {
-    CNaxMatrix4 inverse;
-    if (Inverse(inverse, tol) != 0) {
-      condition = nax::detail::PseudoInfinity<T>();
-      return 3;
-    }
-    result = inverse;
-    condition = Norm(norm) * result.Norm(norm);
-    return 0;
+    return nax::detail::InverseWithCondition(*this, result, norm, tol, condition);
   }
   /// Inverse of a diagonal matrix: 1, or 0 on refusal.
   int32 DiagInverse(CNaxMatrix4& result, T tol) const { return Ops::DiagInverse(a, result.a, tol); }
   /// Solves this x = rhs through the inverse; the status of Inverse.
   int32 SolveSystem(const Vector& rhs, Vector& solution, T tol) const {
-    CNaxMatrix4 inverse;
-    const int32 status = Inverse(inverse, tol);
-    if (status == 0) solution = inverse * rhs;
-    return status;
+    return nax::detail::SolveByInverse(*this, rhs, solution, tol);
   }
   /// SolveSystem with the condition number of the norm form of Inverse.
   int32 SolveSystem(const Vector& rhs, Vector& solution, naxMatrixNorm norm, T tol, T& condition) const {
-    CNaxMatrix4 inverse;
-    const int32 status = Inverse(inverse, norm, tol, condition);
-    if (status == 0) solution = inverse * rhs;
-    return status;
+    return nax::detail::SolveByInverse(*this, rhs, solution, norm, tol, condition);
   }
 
   // ---- Decompositions ------------------------------------------------------------------------

@@ -5,16 +5,14 @@
 #include <random>
 #include <vector>
 
+#include "matrix/matrix_test_support.h"
 #include "nax/base_matrix.h"
 
 namespace {
 
 template <typename T>
 CNaxBaseMatrix<T> Random(int32 rows, int32 cols, std::mt19937& generator) {
-  std::uniform_real_distribution<double> uniform(-1.0, 1.0);
-  CNaxBaseMatrix<T> m(rows, cols);
-  for (int32 i = 0; i < rows * cols; ++i) m[i] = T(uniform(generator));
-  return m;
+  return nax::test::RandomMatrix<T>(rows, cols, generator);
 }
 
 // The blocked product adds each element's products in index order, so it equals the plain

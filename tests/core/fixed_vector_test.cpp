@@ -5,47 +5,34 @@
 #include <cmath>
 #include <random>
 
+#include "matrix/matrix_test_support.h"
 #include "nax/vector_routines.h"
 
 namespace {
 
-template <typename T>
-class FixedVectorTest : public ::testing::Test {};
-using RealTypes = ::testing::Types<float, double>;
-TYPED_TEST_SUITE(FixedVectorTest, RealTypes);
+using nax::test::Eps;
 
 template <typename T>
-T Eps() {
-  return std::is_same_v<T, float> ? T(1e-4) : T(1e-10);
-}
+class FixedVectorTest : public ::testing::Test {};
+TYPED_TEST_SUITE(FixedVectorTest, nax::test::RealTypes);
 
 template <typename T>
 CNaxVector3<T> Random3(std::mt19937& rng) {
-  std::uniform_real_distribution<T> u(-1, 1);
-  const T x = u(rng), y = u(rng), z = u(rng);
-  return CNaxVector3<T>(x, y, z);
+  return nax::test::RandomFixed<CNaxVector3<T>>(rng);
 }
 
 TYPED_TEST(FixedVectorTest, ConstructorsAndTheIgnoredInteger) {
   using T = TypeParam;
-  const CNaxVector3<T> filled(T(7));
-  EXPECT_EQ(filled.x, T(7));
-  EXPECT_EQ(filled.z, T(7));
-  const CNaxVector3<T> zeros(int32(7));
-  EXPECT_EQ(zeros.x, T(0));
-  EXPECT_EQ(zeros.z, T(0));
-  const CNaxVector4<T> zeros4(int32(3));
-  EXPECT_EQ(zeros4.w, T(0));
-  const CNaxVector2<T> half(0.5);
-  EXPECT_EQ(half.y, T(0.5));
+  EXPECT_EQ(CNaxVector3<T>(int32(7)), CNaxVector3<T>());  // the integer is deliberately ignored
+  EXPECT_EQ(CNaxVector4<T>(int32(3)), CNaxVector4<T>());
+  EXPECT_EQ(CNaxVector3<T>(T(7)), CNaxVector3<T>(7, 7, 7));
+  EXPECT_EQ(CNaxVector2<T>(0.5), CNaxVector2<T>(T(0.5), T(0.5)));
   const T data[4] = {1, 2, 3, 4};
   const CNaxVectorN<T> n(4, data);
-  const CNaxVector3<T> head(n);
-  EXPECT_EQ(head, CNaxVector3<T>(1, 2, 3));
+  EXPECT_EQ(CNaxVector3<T>(n), CNaxVector3<T>(1, 2, 3));
   CNaxVector4<T> v4;
   v4 = n;
-  EXPECT_EQ(v4[3], T(4));
-  EXPECT_EQ(v4.Dim(), 4);
+  EXPECT_EQ(v4, CNaxVector4<T>(data));
 }
 
 TYPED_TEST(FixedVectorTest, LengthsNormalizingAndTheDeadZone) {
@@ -59,8 +46,6 @@ TYPED_TEST(FixedVectorTest, LengthsNormalizingAndTheDeadZone) {
   // IsAlmostZero is a closed interval on the length.
   const CNaxVector2<T> w(3, 4);
   EXPECT_EQ(w.IsAlmostZero(T(5)), 1);
-  EXPECT_EQ(w.Norm1(), T(7));
-  EXPECT_EQ(w.NormInf(), T(4));
   CNaxVector4<T> u(1, -2, 2, 4);
   EXPECT_EQ(u.Normalize(), 1);
   EXPECT_NEAR(u.Length(), T(1), Eps<T>());
@@ -192,10 +177,6 @@ TYPED_TEST(FixedVectorTest, CombinationsAndArrays) {
   EXPECT_EQ(naxAppendVectorArray(2, target, 3, vs), 5);
   EXPECT_EQ(target[4], vs[2]);
   EXPECT_EQ(target[0], CNaxVector3<T>());
-  CNaxVector2<T> a(1, 2), b(3, 4);
-  naxSwapVectors(a, b);
-  EXPECT_EQ(a, CNaxVector2<T>(3, 4));
-  EXPECT_EQ(naxFindMidpoint(a, b), CNaxVector2<T>(2, 3));
   const T d1[4] = {1, 2, 3, 4}, d2[4] = {4, 3, 2, 1};
   const CNaxVectorN<T> n1(4, d1), n2(4, d2);
   EXPECT_EQ(naxPartialDotProduct(1, 0, 2, n1, n2), T(2 * 4 + 3 * 3));

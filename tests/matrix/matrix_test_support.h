@@ -1,13 +1,17 @@
-// Shared fixtures of the matrix tests: random and structured operands, plain reference
-// products and element-wise distances.
+// Shared fixtures of the matrix, vector and algebra tests: random and structured operands,
+// plain reference products and element-wise distances, for the run-time and the fixed sizes.
 #ifndef NAX_TESTS_MATRIX_TEST_SUPPORT_H
 #define NAX_TESTS_MATRIX_TEST_SUPPORT_H
 
 #include <algorithm>
 #include <cmath>
 #include <random>
+#include <type_traits>
 #include <vector>
 
+#include <gtest/gtest.h>
+
+#include "nax/fixed_matrix_routines.h"
 #include "nax/matrix_n.h"
 
 namespace nax::test {
@@ -46,6 +50,14 @@ CNaxMatrixN<T> RandomDominant(int32 n, std::mt19937& generator) {
   return m;
 }
 
+/// The n x n identity.
+template <typename T = double>
+CNaxMatrixN<T> Identity(int32 n) {
+  CNaxMatrixN<T> m(n);
+  m.Unit();
+  return m;
+}
+
 /// Plain triple-loop product in double, the reference for the tests.
 template <typename T>
 std::vector<double> ReferenceProduct(const CNaxBaseMatrix<T>& a, const CNaxBaseMatrix<T>& b) {
@@ -76,6 +88,47 @@ double OrthogonalityError(const CNaxBaseMatrix<T>& m) {
     for (int32 j = 0; j < product.ColsNb(); ++j)
       d = std::max(d, std::fabs(double(product(i, j)) - (i == j ? 1.0 : 0.0)));
   return d;
+}
+
+// ---- Fixed sizes ------------------------------------------------------------------------------
+
+using RealTypes = ::testing::Types<float, double>;
+
+/// A tolerance near the rounding of T: 2e-4 for float, 1e-10 for double.
+template <typename T>
+T Eps() {
+  return std::is_same_v<T, float> ? T(2e-4) : T(1e-10);
+}
+
+/// The element type of a fixed matrix or vector.
+template <typename F>
+using ElementOf = std::remove_cv_t<std::remove_reference_t<decltype(std::declval<F&>()[0])>>;
+
+/// A fixed matrix (or vector) of k = RowsNb() * ColsNb() (or Dim()) uniform elements in [lo, hi].
+template <typename F, typename T = ElementOf<F>>
+F RandomFixed(std::mt19937& generator, T lo = T(-1), T hi = T(1)) {
+  std::uniform_real_distribution<T> uniform(lo, hi);
+  T v[16];
+  for (T& x : v) x = uniform(generator);
+  return F(v);
+}
+
+/// The identity of a fixed size.
+template <typename M>
+M FixedIdentity() {
+  M m;
+  m.Unit();
+  return m;
+}
+
+/// Element-wise |a - b| <= tol over the first k elements of two fixed matrices or vectors.
+template <typename F, typename T>
+void ExpectFixedNear(const F& a, const F& b, T tol, int32 k) {
+  for (int32 i = 0; i < k; ++i) EXPECT_NEAR(a[i], b[i], tol) << "element " << i;
+}
+template <typename M, typename T>
+void ExpectMatrixNear(const M& a, const M& b, T tol) {
+  ExpectFixedNear(a, b, tol, a.RowsNb() * a.ColsNb());
 }
 
 }  // namespace nax::test

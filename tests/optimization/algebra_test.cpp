@@ -5,15 +5,15 @@
 #include <cmath>
 #include <random>
 
+#include "matrix/matrix_test_support.h"
 #include "nax/algebra.h"
-#include "nax/matrix_n.h"
+#include "nax/matrix3.h"
 
 namespace {
 
 template <typename T>
 class AlgebraTest : public ::testing::Test {};
-using RealTypes = ::testing::Types<float, double>;
-TYPED_TEST_SUITE(AlgebraTest, RealTypes);
+TYPED_TEST_SUITE(AlgebraTest, nax::test::RealTypes);
 
 template <typename T>
 T Tol() {
@@ -22,6 +22,14 @@ T Tol() {
 template <typename T>
 T Loose() {
   return std::is_same_v<T, float> ? T(2e-3) : T(1e-8);
+}
+
+// Solve3x3System on a row-major array of coefficients and a right side.
+template <typename T>
+int32 Solve3(const T (&m)[9], const T (&r)[3], T& x, T& y, T& z) {
+  int32 quality;
+  return CNaxAlgebra::Solve3x3System(m[0], m[1], m[2], m[3], m[4], m[5], m[6], m[7], m[8], r[0], r[1], r[2], x, y,
+                                     z, quality, Tol<T>());
 }
 
 TYPED_TEST(AlgebraTest, ReducedQuadraticRootsAndOrder) {
@@ -160,18 +168,12 @@ TYPED_TEST(AlgebraTest, ThreeByThreeRegularSystems) {
   std::mt19937 rng(3);
   std::uniform_real_distribution<T> u(-1, 1);
   for (int k = 0; k < 200; ++k) {
-    T m[9], s[3], r[3];
+    T m[9], s[3], r[3], x, y, z;
     for (T& v : m) v = u(rng);
     for (T& v : s) v = u(rng);
     for (int i = 0; i < 3; ++i) r[i] = m[3 * i] * s[0] + m[3 * i + 1] * s[1] + m[3 * i + 2] * s[2];
-    T x, y, z;
-    int32 quality;
-    const int32 result = CNaxAlgebra::Solve3x3System(m[0], m[1], m[2], m[3], m[4], m[5], m[6], m[7], m[8],
-                                                     r[0], r[1], r[2], x, y, z, quality, Tol<T>());
-    ASSERT_EQ(result, 1);
-    const T det = std::fabs(m[0] * (m[4] * m[8] - m[5] * m[7]) - m[1] * (m[3] * m[8] - m[5] * m[6]) +
-                            m[2] * (m[3] * m[7] - m[4] * m[6]));
-    if (det < T(0.05)) continue;
+    ASSERT_EQ(Solve3(m, r, x, y, z), 1);
+    if (std::fabs(CNaxMatrix3<T>(m).Det()) < T(0.05)) continue;
     EXPECT_NEAR(x, s[0], Loose<T>() * 20);
     EXPECT_NEAR(y, s[1], Loose<T>() * 20);
     EXPECT_NEAR(z, s[2], Loose<T>() * 20);
@@ -181,42 +183,27 @@ TYPED_TEST(AlgebraTest, ThreeByThreeRegularSystems) {
 TYPED_TEST(AlgebraTest, ThreeByThreeRankDescent) {
   using T = TypeParam;
   T x, y, z;
-  int32 quality;
   // All coefficients nought: (1, 1, 1) and -2 whatever the right side.
-  EXPECT_EQ(CNaxAlgebra::Solve3x3System(T(0), T(0), T(0), T(0), T(0), T(0), T(0), T(0), T(0), T(4), T(5),
-                                        T(6), x, y, z, quality, Tol<T>()),
-            -2);
-  EXPECT_EQ(x, T(1));
-  EXPECT_EQ(y, T(1));
-  EXPECT_EQ(z, T(1));
+  EXPECT_EQ(Solve3<T>({0, 0, 0, 0, 0, 0, 0, 0, 0}, {4, 5, 6}, x, y, z), -2);
+  EXPECT_EQ(CNaxVector3<T>(x, y, z), CNaxVector3<T>(1, 1, 1));
   // Inconsistent: rows 1 and 2 equal, different right sides.
-  EXPECT_EQ(CNaxAlgebra::Solve3x3System(T(1), T(2), T(3), T(1), T(2), T(3), T(0), T(1), T(1), T(1), T(2),
-                                        T(0), x, y, z, quality, Tol<T>()),
-            -1);
+  EXPECT_EQ(Solve3<T>({1, 2, 3, 1, 2, 3, 0, 1, 1}, {1, 2, 0}, x, y, z), -1);
   EXPECT_EQ(x, T(0));
   // Rank two, consistent: rows 1, 2 independent, row 3 their sum.
   const T m[9] = {1, 2, 3, 0, 1, 4, 1, 3, 7};
   const T r[3] = {6, 5, 11};
-  EXPECT_EQ(CNaxAlgebra::Solve3x3System(m[0], m[1], m[2], m[3], m[4], m[5], m[6], m[7], m[8], r[0], r[1],
-                                        r[2], x, y, z, quality, Tol<T>()),
-            -2);
+  EXPECT_EQ(Solve3(m, r, x, y, z), -2);
   for (int i = 0; i < 3; ++i) EXPECT_NEAR(m[3 * i] * x + m[3 * i + 1] * y + m[3 * i + 2] * z, r[i], Loose<T>());
   // The minors of rows (1, 2): xy = 1, xz = 4, yz = 5; yz wins, so x is set to 1.
   EXPECT_EQ(x, T(1));
   // Rank one: the largest coefficient of the first non-zero row is solved for.
-  EXPECT_EQ(CNaxAlgebra::Solve3x3System(T(1), T(4), T(2), T(2), T(8), T(4), T(0), T(0), T(0), T(9), T(18),
-                                        T(0), x, y, z, quality, Tol<T>()),
-            -2);
+  EXPECT_EQ(Solve3<T>({1, 4, 2, 2, 8, 4, 0, 0, 0}, {9, 18, 0}, x, y, z), -2);
   EXPECT_EQ(x, T(1));
   EXPECT_EQ(z, T(1));
   EXPECT_NEAR(y, T(1.5), Loose<T>());
   // Ties in the rank-one step: x wins against y and z.
-  EXPECT_EQ(CNaxAlgebra::Solve3x3System(T(0), T(0), T(0), T(2), T(2), T(2), T(0), T(0), T(0), T(0), T(6),
-                                        T(0), x, y, z, quality, Tol<T>()),
-            -2);
-  EXPECT_EQ(x, T(1));
-  EXPECT_EQ(y, T(1));
-  EXPECT_EQ(z, T(1));
+  EXPECT_EQ(Solve3<T>({0, 0, 0, 2, 2, 2, 0, 0, 0}, {0, 6, 0}, x, y, z), -2);
+  EXPECT_EQ(CNaxVector3<T>(x, y, z), CNaxVector3<T>(1, 1, 1));
 }
 
 TYPED_TEST(AlgebraTest, ConjugateGradientSolvesSymmetricAndGeneralSystems) {
@@ -224,24 +211,14 @@ TYPED_TEST(AlgebraTest, ConjugateGradientSolvesSymmetricAndGeneralSystems) {
   const int n = 6;
   std::mt19937 rng(12);
   std::uniform_real_distribution<T> u(-1, 1);
-  CNaxMatrixN<T> general(n), spd(n);
-  for (int i = 0; i < n; ++i)
-    for (int j = 0; j < n; ++j) general(i, j) = u(rng) + (i == j ? T(3) : T(0));
-  for (int i = 0; i < n; ++i)
-    for (int j = 0; j < n; ++j) {
-      T s = i == j ? T(1) : T(0);
-      for (int k = 0; k < n; ++k) s += general(k, i) * general(k, j);
-      spd(i, j) = s;
-    }
+  // A diagonally dominant general matrix and the positive G^T G + I.
+  CNaxMatrixN<T> general = nax::test::RandomDominant<T>(n, rng);
+  CNaxMatrixN<T> spd(CNaxMatrixN<T>(general.Transpose() * general));
+  for (int i = 0; i < n; ++i) spd(i, i) += T(1);
   CNaxVectorN<T> solution(n);
   for (int i = 0; i < n; ++i) solution[i] = u(rng);
   for (const CNaxMatrixN<T>* m : {&spd, &general}) {
-    CNaxVectorN<T> rhs(n);
-    for (int i = 0; i < n; ++i) {
-      T s = 0;
-      for (int j = 0; j < n; ++j) s += (*m)(i, j) * solution[j];
-      rhs[i] = s;
-    }
+    const CNaxVectorN<T> rhs(*m * solution);
     CNaxVectorN<T> x(n);
     ASSERT_EQ(CNaxAlgebra::SolveByCongugateGradient(*m, rhs, x, Loose<T>(), T(0)), 1);
     for (int i = 0; i < n; ++i) EXPECT_NEAR(x[i], solution[i], Loose<T>() * 100);
@@ -253,20 +230,13 @@ TYPED_TEST(AlgebraTest, ConjugateGradientSolvesSymmetricAndGeneralSystems) {
 }
 
 TEST(AlgebraCounting, PermutationsAndCombinations) {
-  EXPECT_EQ(CNaxAlgebra::Permutations<int32>(-3), 1);
-  EXPECT_EQ(CNaxAlgebra::Permutations<int32>(0), 1);
-  EXPECT_EQ(CNaxAlgebra::Permutations<int32>(5), 120);
-  EXPECT_EQ(CNaxAlgebra::Permutations<int32>(12), 479001600);
-  EXPECT_EQ(CNaxAlgebra::Permutations<uint32>(12), 479001600u);
+  const int32 permutations[][2] = {{-3, 1}, {0, 1}, {5, 120}, {12, 479001600}};
+  for (const auto& p : permutations) EXPECT_EQ(CNaxAlgebra::Permutations<int32>(p[0]), p[1]);
   // 13! leaves the range of uint32: the low 32 bits of 6227020800.
   EXPECT_EQ(CNaxAlgebra::Permutations<uint32>(13), static_cast<uint32>(6227020800ull));
-  EXPECT_EQ(CNaxAlgebra::Combinations<int32>(5, 7), 1);
-  EXPECT_EQ(CNaxAlgebra::Combinations<int32>(5, 0), 1);
-  EXPECT_EQ(CNaxAlgebra::Combinations<int32>(5, -2), 1);
-  EXPECT_EQ(CNaxAlgebra::Combinations<int32>(5, 1), 5);
-  EXPECT_EQ(CNaxAlgebra::Combinations<int32>(5, 4), 5);
-  EXPECT_EQ(CNaxAlgebra::Combinations<int32>(6, 2), 15);
-  EXPECT_EQ(CNaxAlgebra::Combinations<int32>(10, 3), 120);
+  // k outside 1 to n - 1 gives 1; Pascal's rule holds for the rest.
+  const int32 combinations[][3] = {{5, 7, 1}, {5, 0, 1}, {5, -2, 1}, {5, 4, 5}, {10, 3, 120}};
+  for (const auto& c : combinations) EXPECT_EQ(CNaxAlgebra::Combinations<int32>(c[0], c[1]), c[2]);
   EXPECT_EQ(CNaxAlgebra::Combinations<uint32>(30, 15), 155117520u);
   for (int32 n = 0; n < 20; ++n)
     for (int32 k = 1; k < n; ++k)

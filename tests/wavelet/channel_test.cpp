@@ -1,55 +1,23 @@
 // Channels and the transform: perfect reconstruction over filters, types, depths, sizes and
 // offsets; shapes of the split; band values by hand; normalization factors; ownership;
 // printing.
-#include <gtest/gtest.h>
-
-#include <cmath>
 #include <functional>
 #include <iostream>
-#include <memory>
-#include <random>
 #include <sstream>
 #include <string>
-#include <vector>
 
-#include "nax/channel.h"
+#include "wavelet_test_support.h"
 
 namespace {
 
+using namespace nax_test;
+
 template <typename T>
 class ChannelTest : public ::testing::Test {};
-using RealTypes = ::testing::Types<float, double>;
 TYPED_TEST_SUITE(ChannelTest, RealTypes);
 
-template <typename T>
-using Owned = std::unique_ptr<CNaxChannel<T>>;
-
-template <typename T>
-std::vector<T> RandomSamples(int32 n, std::mt19937& rng) {
-  std::uniform_real_distribution<double> u(-1, 1);
-  std::vector<T> v(n);
-  for (auto& x : v) x = T(u(rng));
-  return v;
-}
-
-template <typename T>
-T Tolerance() {
-  return sizeof(T) == 4 ? T(2e-4) : T(1e-11);
-}
-
-// Largest magnitude in a tree: reconstruction is exact to rounding relative to it (3_3,
-// with its negative 4/9, lets the low bands grow with the depth).
-template <typename T>
-double MaxAbs(const CNaxChannel<T>* c) {
-  double m = 0;
-  if (c == nullptr) return m;
-  if (c->GetData() != nullptr)
-    for (int32 i = 0; i < c->GetColsNb() * c->GetRowsNb(); ++i)
-      m = std::max(m, static_cast<double>(std::fabs(c->GetData()[i])));
-  for (int32 k = 0; k < c->GetSubChannelsNb(); ++k) m = std::max(m, MaxAbs(c->SubChannel(k)));
-  return m;
-}
-
+// Reconstruction is exact to rounding relative to the largest coefficient (3_3, with its
+// negative 4/9, lets the low bands grow with the depth).
 TYPED_TEST(ChannelTest, PerfectReconstruction) {
   using T = TypeParam;
   std::mt19937 rng(1);
@@ -109,6 +77,9 @@ TYPED_TEST(ChannelTest, PerfectReconstruction) {
 // (columns first), then Unite.
 TYPED_TEST(ChannelTest, OnePassEqualsStepByStep) {
   using T = TypeParam;
+  // Lift pairs {from band, to band, along rows} per type, in the order of the forward step.
+  const int32 steps[3][4][3] = {
+      {{0, 1, 1}}, {{0, 1, 0}}, {{0, 2, 1}, {3, 1, 1}, {0, 3, 0}, {2, 1, 0}}};
   std::mt19937 rng(21);
   const int32 sizes[][2] = {{2, 2}, {3, 5}, {8, 3}, {13, 40}, {40, 13}, {31, 64}};
   const int32 offsets[][2] = {{0, 0}, {1, 1}, {2, 3}, {5, 0}};
@@ -122,29 +93,21 @@ TYPED_TEST(ChannelTest, OnePassEqualsStepByStep) {
                                             << size[1] << " offset " << offset[0] << ","
                                             << offset[1] << " type " << type);
           const auto kind = static_cast<naxChannelType>(type);
+          const int32 count = type == 3 ? 4 : 1;
           CNaxChannel<T> raw(size[0], size[1], samples.data(), offset[0], offset[1]);
           CNaxChannel<T> manual(size[0], size[1], offset[0], offset[1]);
           manual.CreateOneLevelSubChannels(&filter, kind, naxNoNormalization);
           manual.Split(&raw);
-          if (type == 1) manual.LiftDirect(manual.SubChannel(0), manual.SubChannel(1), 1);
-          if (type == 2) manual.LiftDirect(manual.SubChannel(0), manual.SubChannel(1), 0);
-          if (type == 3) {
-            manual.LiftDirect(manual.SubChannel(0), manual.SubChannel(2), 1);
-            manual.LiftDirect(manual.SubChannel(3), manual.SubChannel(1), 1);
-            manual.LiftDirect(manual.SubChannel(0), manual.SubChannel(3), 0);
-            manual.LiftDirect(manual.SubChannel(2), manual.SubChannel(1), 0);
-          }
+          const int32* step = steps[type - 1][0];
+          for (int32 k = 0; k < count; ++k, step += 3)
+            manual.LiftDirect(manual.SubChannel(step[0]), manual.SubChannel(step[1]), step[2]);
           Owned<T> fused(raw.FWTStep(&filter, kind));
           ASSERT_NE(fused, nullptr);
           EXPECT_EQ(naxAreChannelsAlmostEqual(fused.get(), &manual, T(0)), 1);
 
-          if (type == 1) manual.LiftInverse(manual.SubChannel(0), manual.SubChannel(1), 1);
-          if (type == 2) manual.LiftInverse(manual.SubChannel(0), manual.SubChannel(1), 0);
-          if (type == 3) {
-            manual.LiftInverse(manual.SubChannel(0), manual.SubChannel(3), 0);
-            manual.LiftInverse(manual.SubChannel(2), manual.SubChannel(1), 0);
-            manual.LiftInverse(manual.SubChannel(0), manual.SubChannel(2), 1);
-            manual.LiftInverse(manual.SubChannel(3), manual.SubChannel(1), 1);
+          for (int32 k = 0; k < count; ++k) {  // columns first: 2, 3, 0, 1 for 2D
+            step = steps[type - 1][(k + 2) % count];
+            manual.LiftInverse(manual.SubChannel(step[0]), manual.SubChannel(step[1]), step[2]);
           }
           CNaxChannel<T> united(size[0], size[1], offset[0], offset[1]);
           manual.Unite(&united);
@@ -157,57 +120,37 @@ TYPED_TEST(ChannelTest, OnePassEqualsStepByStep) {
   }
 }
 
+// Band shapes by the parity of the offset: {cols, rows, offset X, offset Y} per band.
 TYPED_TEST(ChannelTest, SplitShapes) {
   using T = TypeParam;
   CNaxWaveletFilter<T> filter(naxWavelet2_2);
-  {  // odd length, even offset: low 3, high 2
-    CNaxChannel<T> c(5, 2, 4, 0);
-    c.CreateOneLevelSubChannels(&filter, naxChannelRows, naxNoNormalization);
-    EXPECT_EQ(c.GetLowColsNb(), 3);
-    EXPECT_EQ(c.GetHighColsNb(), 2);
-    EXPECT_EQ(c.SubChannel(0)->GetOffsetX(), 2);
-    EXPECT_EQ(c.SubChannel(1)->GetOffsetX(), 2);
-    EXPECT_EQ(c.GetLowRowsNb(), 2);
-  }
-  {  // odd length, odd offset: low 2, high 3
-    CNaxChannel<T> c(5, 2, 5, 0);
-    c.CreateOneLevelSubChannels(&filter, naxChannelRows, naxNoNormalization);
-    EXPECT_EQ(c.GetLowColsNb(), 2);
-    EXPECT_EQ(c.GetHighColsNb(), 3);
-    EXPECT_EQ(c.SubChannel(0)->GetOffsetX(), 3);
-    EXPECT_EQ(c.SubChannel(1)->GetOffsetX(), 2);
-  }
-  {  // two dimensions: 7 x 4 from (3, 2)
-    CNaxChannel<T> c(7, 4, 3, 2);
-    c.CreateOneLevelSubChannels(&filter, naxChannel2D, naxNormalizationByFirstNorms);
-    ASSERT_EQ(c.GetSubChannelsNb(), 4);
-    EXPECT_TRUE(c.IsDecomposed());
-    const int32 expected[4][4] = {{3, 2, 2, 1}, {4, 2, 1, 1}, {4, 2, 1, 1}, {3, 2, 2, 1}};
-    for (int32 k = 0; k < 4; ++k) {
-      const CNaxChannel<T>* s = c.SubChannel(k);
-      EXPECT_EQ(s->GetColsNb(), expected[k][0]) << k;
-      EXPECT_EQ(s->GetRowsNb(), expected[k][1]) << k;
-      EXPECT_EQ(s->GetOffsetX(), expected[k][2]) << k;
-      EXPECT_EQ(s->GetOffsetY(), expected[k][3]) << k;
-      EXPECT_EQ(s->GetFilter(), &filter);
-      EXPECT_EQ(s->GetType(), naxChannel2D);
+  struct Case {
+    int32 cols, rows, ox, oy;
+    naxChannelType type;
+    int32 bands[4][4];
+  };
+  const Case cases[] = {
+      {5, 2, 4, 0, naxChannelRows, {{3, 2, 2, 0}, {2, 2, 2, 0}}},  // even offset: low 3
+      {5, 2, 5, 0, naxChannelRows, {{2, 2, 3, 0}, {3, 2, 2, 0}}},  // odd offset: low 2
+      {3, 7, 0, 1, naxChannelColumns, {{3, 3, 0, 1}, {3, 4, 0, 0}}},
+      {7, 4, 3, 2, naxChannel2D, {{3, 2, 2, 1}, {4, 2, 1, 1}, {4, 2, 1, 1}, {3, 2, 2, 1}}}};
+  for (const Case& c : cases) {
+    CNaxChannel<T> node(c.cols, c.rows, c.ox, c.oy);
+    node.CreateOneLevelSubChannels(&filter, c.type, naxNormalizationByFirstNorms);
+    ASSERT_EQ(node.GetSubChannelsNb(), c.type == naxChannel2D ? 4 : 2);
+    EXPECT_TRUE(node.IsDecomposed());
+    for (int32 k = 0; k < node.GetSubChannelsNb(); ++k) {
+      const CNaxChannel<T>* s = node.SubChannel(k);
+      const int32 got[4] = {s->GetColsNb(), s->GetRowsNb(), s->GetOffsetX(), s->GetOffsetY()};
+      for (int32 i = 0; i < 4; ++i) EXPECT_EQ(got[i], c.bands[k][i]) << "type " << c.type << " band " << k;
       EXPECT_EQ(s->GetTypeOfNormalization(), naxNormalizationByFirstNorms);
       EXPECT_EQ(s->GetData()[0], T(0));
     }
   }
-  {  // columns: the rows are split
-    CNaxChannel<T> c(3, 7, 0, 1);
-    c.CreateOneLevelSubChannels(&filter, naxChannelColumns, naxNoNormalization);
-    EXPECT_EQ(c.GetLowColsNb(), 3);
-    EXPECT_EQ(c.GetLowRowsNb(), 3);
-    EXPECT_EQ(c.GetHighRowsNb(), 4);
-  }
-  {  // other types leave no sub-channels
-    CNaxChannel<T> c(3, 7, 0, 1);
-    c.CreateOneLevelSubChannels(&filter, naxChannelNone, naxNoNormalization);
-    EXPECT_EQ(c.GetSubChannelsNb(), 0);
-    EXPECT_FALSE(c.IsDecomposed());
-  }
+  CNaxChannel<T> none(3, 7, 0, 1);  // other types leave no sub-channels
+  none.CreateOneLevelSubChannels(&filter, naxChannelNone, naxNoNormalization);
+  EXPECT_EQ(none.GetSubChannelsNb(), 0);
+  EXPECT_FALSE(none.IsDecomposed());
 }
 
 TYPED_TEST(ChannelTest, SplitDealsByAbsoluteParity) {
@@ -231,9 +174,8 @@ TYPED_TEST(ChannelTest, SplitDealsByAbsoluteParity) {
     }
   }
   // Row-major order inside a band: HL (even X, odd Y) from (1, 2) starts at X = 2, Y = 3.
-  EXPECT_EQ(split.SubChannel(3)->GetData()[0], T(23));
-  EXPECT_EQ(split.SubChannel(3)->GetData()[1], T(43));
-  EXPECT_EQ(split.SubChannel(3)->GetData()[2], T(25));
+  const T firstHL[3] = {23, 43, 25};
+  for (int32 i = 0; i < 3; ++i) EXPECT_EQ(split.SubChannel(3)->GetData()[i], firstHL[i]);
   CNaxChannel<T> united(cols, rows, ox, oy);
   split.Unite(&united);
   EXPECT_EQ(united.RawChannelIsAlmostEqual(&raw, T(0)), 1);
@@ -250,13 +192,10 @@ TYPED_TEST(ChannelTest, BandValuesFollowTheLiftingRules) {
   const T* h = tree->SubChannel(1)->GetData();
   const T* l = tree->SubChannel(0)->GetData();
   // Predict: d0 = 4 - (1 + 2)/2 = 2.5, d1 = 8 - (2 + 5)/2 = 4.5.
-  EXPECT_EQ(h[0], T(2.5));
-  EXPECT_EQ(h[1], T(4.5));
-  // Update: s0 = 1 + 0.5 * 2.5, s1 = 2 + (2.5 + 4.5)/4, s2 = 5 + 0.5 * 4.5.
-  EXPECT_EQ(l[0], T(2.25));
-  EXPECT_EQ(l[1], T(3.75));
-  EXPECT_EQ(l[2], T(7.25));
-  EXPECT_EQ(l[3], T(2.25));  // second row
+  // Update: s0 = 1 + 0.5 * 2.5, s1 = 2 + (2.5 + 4.5)/4, s2 = 5 + 0.5 * 4.5; then row two.
+  const T high[2] = {2.5, 4.5}, low[4] = {2.25, 3.75, 7.25, 2.25};
+  for (int32 i = 0; i < 4; ++i) EXPECT_EQ(l[i], low[i]) << i;
+  for (int32 i = 0; i < 2; ++i) EXPECT_EQ(h[i], high[i]) << i;
 
   // Haar 1_1 in two dimensions on a 2 x 2 block: d = b - a, s = a + d / 2 along rows, then
   // the same along columns.
@@ -266,10 +205,8 @@ TYPED_TEST(ChannelTest, BandValuesFollowTheLiftingRules) {
   Owned<T> t2(b.FWTStep(&haar, naxChannel2D));
   // Rows: (1, 3) -> s 2, d 2; (5, 11) -> s 8, d 6. Columns: LL (2, 8) -> 5, HL 6;
   // LH (2, 6) -> 4, HH 4.
-  EXPECT_EQ(t2->SubChannel(0)->GetData()[0], T(5));
-  EXPECT_EQ(t2->SubChannel(3)->GetData()[0], T(6));
-  EXPECT_EQ(t2->SubChannel(2)->GetData()[0], T(4));
-  EXPECT_EQ(t2->SubChannel(1)->GetData()[0], T(4));
+  const T bands[4] = {5, 4, 4, 6};  // LL, HH, LH, HL
+  for (int32 k = 0; k < 4; ++k) EXPECT_EQ(t2->SubChannel(k)->GetData()[0], bands[k]) << k;
 
   // 4_2 (three steps) on one row X = 0..3: 2 0 4 8.
   // Update with prime (-1/4, -1/4), form B: e0 = 2 - 0.5 * 0 = 2, e1 = 4 - 0.25 * (0 + 8) = 2.
@@ -279,68 +216,50 @@ TYPED_TEST(ChannelTest, BandValuesFollowTheLiftingRules) {
   CNaxWaveletFilter<T> f42(naxWavelet4_2);
   CNaxChannel<T> c42(4, 2, four.data(), 0, 0);
   Owned<T> t42(c42.FWTStep(&f42, naxChannelRows));
-  EXPECT_EQ(t42->SubChannel(1)->GetData()[0], T(-4));
-  EXPECT_EQ(t42->SubChannel(1)->GetData()[1], T(4));
-  EXPECT_EQ(t42->SubChannel(0)->GetData()[0], T(0.5));
-  EXPECT_EQ(t42->SubChannel(0)->GetData()[1], T(2));
+  const T values[4] = {0.5, 2, -4, 4};  // low, then high
+  for (int32 i = 0; i < 4; ++i) EXPECT_EQ(t42->SubChannel(i / 2)->GetData()[i % 2], values[i]) << i;
 }
 
+// Each band of level j is scaled by the norm of its own filters times the low norm of the
+// levels above; Denormalize undoes it.
 TYPED_TEST(ChannelTest, NormalizationFactorsPerBand) {
   using T = TypeParam;
   std::mt19937 rng(3);
   const std::vector<T> samples = RandomSamples<T>(17 * 19, rng);
-  for (int32 wavelet : {0, 3, 7, 10}) {
+  for (int32 wavelet : {0, 7, 10}) {
     CNaxWaveletFilter<T> filter(static_cast<naxWaveletType>(wavelet));
     for (int32 type = 1; type <= 3; ++type) {
+      const auto kind = static_cast<naxChannelType>(type);
+      Owned<T> plain = MakeTree(samples, 17, 19, &filter, 3, naxNoNormalization, kind, 1);
       for (int32 norm = 1; norm <= 2; ++norm) {
-        const int32 which = norm == 1 ? 1 : 0;
-        const double l = filter.GetLowNorm(which), h = filter.GetHighNorm(which);
-        CNaxChannel<T> a(17, 19, samples.data(), 1, 0), b(17, 19, samples.data(), 1, 0);
-        b.SetTypeOfNormalization(static_cast<naxWaveletNormalization>(norm));
-        Owned<T> plain(a.FWT(&filter, static_cast<naxChannelType>(type), 3));
-        Owned<T> scaled(b.FWT(&filter, static_cast<naxChannelType>(type), 3));
+        const double l = filter.GetLowNorm(2 - norm), h = filter.GetHighNorm(2 - norm);
+        Owned<T> scaled = MakeTree(samples, 17, 19, &filter, 3,
+                                   static_cast<naxWaveletNormalization>(norm), kind, 1);
         ASSERT_EQ(scaled->GetDepth(), 3);
-        EXPECT_EQ(scaled->GetTypeOfNormalization(), norm);
         const int32 dim = type == 3 ? 2 : 1;
-        for (int32 level = 0; level < 3; ++level) {
-          const double down = std::pow(l, dim * level);
-          for (int32 band = 0; band < (type == 3 ? 4 : 2); ++band) {
-            if (band == 0 && level < 2) continue;
-            double factor = 0;
-            if (type == 3)
-              factor = band == 0 ? l * l : band == 1 ? h * h : l * h;
-            else
-              factor = band == 0 ? l : h;
-            factor *= down;
+        for (int32 level = 0; level < 3; ++level)
+          for (int32 band = level < 2 ? 1 : 0; band < 2 * dim; ++band) {
+            double factor = type != 3 ? (band == 0 ? l : h)
+                                      : (band == 0 ? l * l : band == 1 ? h * h : l * h);
+            factor *= std::pow(l, dim * level);
             const CNaxChannel<T>* p = plain->SubChannel(level, band);
             const CNaxChannel<T>* s = scaled->SubChannel(level, band);
-            for (int32 i = 0; i < p->GetColsNb() * p->GetRowsNb(); ++i)
+            for (int32 i = 0; i < Count(p); ++i)
               ASSERT_NEAR(s->GetData()[i], p->GetData()[i] * factor,
-                          Tolerance<T>() * 50 * (1 + std::fabs(p->GetData()[i] * factor)))
-                  << "wavelet " << wavelet << " type " << type << " level " << level << " band "
-                  << band;
+                          Tolerance<T>() * 20 * (1 + std::fabs(p->GetData()[i] * factor)))
+                  << "wavelet " << wavelet << " type " << type << " level " << level;
           }
-        }
-        // Denormalize undoes it.
         scaled->Denormalize();
-        EXPECT_EQ(naxAreChannelsAlmostEqual(scaled.get(), plain.get(), Tolerance<T>() * 50), 1);
+        EXPECT_EQ(naxAreChannelsAlmostEqual(scaled.get(), plain.get(), Tolerance<T>() * 20), 1);
       }
     }
   }
-}
-
-TYPED_TEST(ChannelTest, HaarFirstNormsScaleOnlyTheHighBands) {
-  using T = TypeParam;
-  // Low factor 1: the low band is untouched, the high bands take -0.5 per dimension.
+  // Haar with the first norms: low factor 1, so only the high bands change (-0.5 a dimension).
   const std::vector<T> block = {1, 3, 5, 11};
   CNaxWaveletFilter<T> haar(naxWavelet1_1);
-  CNaxChannel<T> b(2, 2, block.data(), 0, 0);
-  b.SetTypeOfNormalization(naxNormalizationByFirstNorms);
-  Owned<T> t(b.FWT(&haar, naxChannel2D, 1));
-  EXPECT_EQ(t->SubChannel(0)->GetData()[0], T(5));
-  EXPECT_EQ(t->SubChannel(3)->GetData()[0], T(-3));
-  EXPECT_EQ(t->SubChannel(2)->GetData()[0], T(-2));
-  EXPECT_EQ(t->SubChannel(1)->GetData()[0], T(1));
+  Owned<T> t = MakeTree(block, 2, 2, &haar, 1, naxNormalizationByFirstNorms);
+  const T expected[4] = {5, 1, -2, -3};
+  for (int32 k = 0; k < 4; ++k) EXPECT_EQ(t->SubChannel(k)->GetData()[0], expected[k]);
 }
 
 TYPED_TEST(ChannelTest, OwnershipTransitions) {
@@ -358,10 +277,8 @@ TYPED_TEST(ChannelTest, OwnershipTransitions) {
 
   // A raw channel is consumed and left empty.
   Owned<T> tree(raw.FWT(&filter, naxChannel2D, 1));
-  EXPECT_EQ(raw.GetColsNb(), 0);
-  EXPECT_EQ(raw.GetRowsNb(), 0);
+  EXPECT_EQ(raw.GetColsNb() + raw.GetRowsNb(), 0);
   EXPECT_EQ(raw.GetData(), nullptr);
-  EXPECT_FALSE(raw.IsDecomposed());
   EXPECT_EQ(tree->GetDepth(), 1);
 
   // A decomposed channel stays and a deeper clone comes back.
@@ -378,12 +295,9 @@ TYPED_TEST(ChannelTest, OwnershipTransitions) {
 
   // The inverse consumes the tree.
   Owned<T> back(deeper->IFWT());
-  EXPECT_EQ(deeper->GetColsNb(), 0);
-  EXPECT_EQ(deeper->GetRowsNb(), 0);
+  EXPECT_EQ(deeper->GetColsNb() + deeper->GetRowsNb(), 0);
   EXPECT_FALSE(deeper->IsDecomposed());
-  EXPECT_EQ(deeper->GetFilter(), nullptr);
   EXPECT_EQ(back->GetTypeOfNormalization(), naxNoNormalization);
-  EXPECT_FALSE(back->IsDecomposed());
   EXPECT_EQ(back->IFWT(), nullptr);  // nothing to invert
 
   // In-place forms.
@@ -391,9 +305,7 @@ TYPED_TEST(ChannelTest, OwnershipTransitions) {
   inPlace.SetTypeOfNormalization(naxNormalizationBySecondNorms);
   inPlace.FWTInPlace(&filter, naxChannel2D, 2);
   EXPECT_EQ(inPlace.GetDepth(), 2);
-  EXPECT_EQ(inPlace.GetData(), nullptr);
   inPlace.IFWTInPlace();
-  EXPECT_FALSE(inPlace.IsDecomposed());
   CNaxChannel<T> original(12, 9, samples.data(), 0, 0);
   EXPECT_EQ(inPlace.RawChannelIsAlmostEqual(&original, Tolerance<T>()), 1);
 
@@ -401,7 +313,6 @@ TYPED_TEST(ChannelTest, OwnershipTransitions) {
   CNaxChannel<T> row(8, 1, samples.data(), 0, 0);
   EXPECT_EQ(row.FWT(&filter, naxChannelRows, 1), nullptr);
   EXPECT_EQ(row.FWTStep(&filter, naxChannel2D), nullptr);
-  EXPECT_EQ(row.GetColsNb(), 8);
   ASSERT_NE(row.GetData(), nullptr);
   EXPECT_EQ(row(3, 0), samples[3]);
 }
@@ -431,7 +342,6 @@ TYPED_TEST(ChannelTest, StepwiseInverseAndBands) {
   Owned<T> tree(raw.FWT(&filter, naxChannel2D, 2));
 
   EXPECT_EQ(tree->GetHighChannel(3, naxSubChannelHH), nullptr);
-  EXPECT_EQ(tree->GetHighChannel(0, naxSubChannelHH), nullptr);
   EXPECT_EQ(tree->GetHighChannel(1, naxSubChannelLow), nullptr);  // decomposed band
   Owned<T> hl(tree->GetHighChannel(2, naxSubChannelHL));
   ASSERT_NE(hl, nullptr);
@@ -439,8 +349,6 @@ TYPED_TEST(ChannelTest, StepwiseInverseAndBands) {
   Owned<T> low(tree->GetLowChannel());
   EXPECT_EQ(low->RawChannelIsAlmostEqual(tree->SubChannel(1, 0), T(0)), 1);
   EXPECT_EQ(tree->SubChannel(2, 0), nullptr);
-  EXPECT_EQ(tree->SubChannel(0, 4), nullptr);
-  EXPECT_EQ(CNaxChannel<T>().GetLowChannel(), nullptr);
 
   // Invert the lowest level by hand, then the top level.
   CNaxChannel<T>* node = tree->SubChannel(0);
@@ -481,51 +389,37 @@ TYPED_TEST(ChannelTest, CopiesAndComparisons) {
   EXPECT_EQ(level.SubChannel(1)->RawChannelIsAlmostEqual(tree->SubChannel(1), T(0)), 1);
   CNaxChannel<T> shaped(8, 8, 0, 0);
   shaped.CreateOneLevelSubChannels(tree.get());
-  EXPECT_EQ(shaped.GetSubChannelsNb(), 4);
+  ASSERT_EQ(shaped.GetSubChannelsNb(), 4);
+  EXPECT_EQ(shaped.SubChannel(2)->GetColsNb(), tree->SubChannel(2)->GetColsNb());
   EXPECT_EQ(shaped.SubChannel(2)->GetData()[0], T(0));
+  EXPECT_EQ(shaped.SubChannel(2)->GetFilter(), &filter);
   Owned<T> node(tree->CloneRawChannel());  // one node, without its sub-channels
-  EXPECT_FALSE(node->IsDecomposed());
   EXPECT_EQ(node->GetSubChannelsNb(), 0);
 
   // Raw comparisons: shape and offsets first, then the data.
   CNaxChannel<T> a(2, 2, samples.data(), 0, 0), b(2, 2, samples.data(), 0, 1), e(2, 2, 0, 0);
   EXPECT_EQ(a.RawChannelIsAlmostEqual(&b, T(1)), 0);
   EXPECT_EQ(a.RawChannelIsAlmostEqual(&e, T(1)), 0);
-  CNaxChannel<T> e2(2, 2, 0, 0);
-  EXPECT_EQ(e.RawChannelIsAlmostEqual(&e2, T(1)), 1);
   EXPECT_EQ(raw.CloneDecomposedChannel(), nullptr);
-}
-
-TYPED_TEST(ChannelTest, SettersDestroyOnAnotherType) {
-  using T = TypeParam;
-  std::mt19937 rng(13);
-  const std::vector<T> samples = RandomSamples<T>(6 * 6, rng);
-  CNaxWaveletFilter<T> f22(naxWavelet2_2), f44(naxWavelet4_4), other22(naxWavelet2_2);
-  CNaxChannel<T> raw(6, 6, samples.data(), 0, 0);
-  Owned<T> tree(raw.FWT(&f22, naxChannel2D, 1));
-  tree->SetFilter(&other22);  // same wavelet type: kept
-  EXPECT_TRUE(tree->IsDecomposed());
-  tree->SetType(naxChannel2D);
-  EXPECT_TRUE(tree->IsDecomposed());
-  tree->SetFilter(&f44);
-  EXPECT_FALSE(tree->IsDecomposed());
-  EXPECT_EQ(tree->GetColsNb(), 0);
-  EXPECT_EQ(tree->GetFilter(), &f44);
-
-  CNaxChannel<T> raw2(6, 6, samples.data(), 0, 0);
-  Owned<T> tree2(raw2.FWT(&f22, naxChannel2D, 1));
-  tree2->SetType(naxChannelRows);
-  EXPECT_FALSE(tree2->IsDecomposed());
-  EXPECT_EQ(tree2->GetType(), naxChannelRows);
 
   // Clean zeroes the whole tree, Destroy of the lowest band keeps its record.
-  CNaxChannel<T> raw3(6, 6, samples.data(), 0, 0);
-  Owned<T> tree3(raw3.FWT(&f22, naxChannel2D, 1));
-  tree3->Clean();
-  EXPECT_EQ(tree3->SubChannel(1)->GetData()[3], T(0));
-  tree3->DestroyLowestSubChannel();
-  ASSERT_NE(tree3->SubChannel(0), nullptr);
-  EXPECT_EQ(tree3->SubChannel(0)->GetData(), nullptr);
+  Owned<T> shallow = MakeTree(samples, 8, 8, &filter, 1);
+  shallow->Clean();
+  EXPECT_EQ(shallow->SubChannel(1)->GetData()[3], T(0));
+  shallow->DestroyLowestSubChannel();
+  ASSERT_NE(shallow->SubChannel(0), nullptr);
+  EXPECT_EQ(shallow->SubChannel(0)->GetData(), nullptr);
+
+  // Setting a filter of another wavelet type or another split destroys the tree.
+  CNaxWaveletFilter<T> other44(naxWavelet4_4), f22(naxWavelet2_2);
+  tree->SetFilter(&other44);  // same wavelet type: kept
+  tree->SetType(naxChannel2D);
+  EXPECT_TRUE(tree->IsDecomposed());
+  tree->SetFilter(&f22);
+  EXPECT_FALSE(tree->IsDecomposed());
+  EXPECT_EQ(tree->GetColsNb(), 0);
+  copy.SetType(naxChannelRows);
+  EXPECT_FALSE(copy.IsDecomposed());
 }
 
 std::string Printed(const std::function<void()>& f) {

@@ -324,10 +324,7 @@ void CNaxChannel<T>::CopyDataWithShifts(const CNaxChannel<T>* channel, int32 shi
     return;
   }
   ReleaseStorage();
-  m_cols = channel->m_cols;
-  m_rows = channel->m_rows;
-  m_offsetX = channel->m_offsetX;
-  m_offsetY = channel->m_offsetY;
+  CopyGeometry(channel);
   m_normalization = channel->m_normalization;
   m_decomposed = 0;
   if (channel->m_data == nullptr || Size() < 1) return;

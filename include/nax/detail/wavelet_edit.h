@@ -290,27 +290,32 @@ template <typename T>
 void CNaxChannel<T>::PasteRectForRows(const CNaxChannel<T>* channel, CNaxChannel<T>* a,
                                       CNaxChannel<T>* b, CNaxChannel<T>* c, CNaxChannel<T>* d,
                                       int32 margin) {
-  if (channel->m_type != naxChannelRows) return;
-  const CNaxChannel<T>* bands[4] = {a, b, c, d};
-  PasteBands(bands, 2, margin);
+  PasteRectOfType(naxChannelRows, channel, a, b, c, d, margin);
 }
 
 template <typename T>
 void CNaxChannel<T>::PasteRectForColumns(const CNaxChannel<T>* channel, CNaxChannel<T>* a,
                                          CNaxChannel<T>* b, CNaxChannel<T>* c,
                                          CNaxChannel<T>* d, int32 margin) {
-  if (channel->m_type != naxChannelColumns) return;
-  const CNaxChannel<T>* bands[4] = {a, b, c, d};
-  PasteBands(bands, 2, margin);
+  PasteRectOfType(naxChannelColumns, channel, a, b, c, d, margin);
 }
 
 template <typename T>
 void CNaxChannel<T>::PasteRectFor2D(const CNaxChannel<T>* channel, CNaxChannel<T>* a,
                                     CNaxChannel<T>* b, CNaxChannel<T>* c, CNaxChannel<T>* d,
                                     int32 margin) {
-  if (channel->m_type != naxChannel2D) return;
+  PasteRectOfType(naxChannel2D, channel, a, b, c, d, margin);
+}
+
+// Pastes the bands a to d when `channel` was split by `type`: two bands for rows or columns,
+// four for 2D.
+template <typename T>
+void CNaxChannel<T>::PasteRectOfType(naxChannelType type, const CNaxChannel<T>* channel,
+                                     CNaxChannel<T>* a, CNaxChannel<T>* b, CNaxChannel<T>* c,
+                                     CNaxChannel<T>* d, int32 margin) {
+  if (channel->m_type != type) return;
   const CNaxChannel<T>* bands[4] = {a, b, c, d};
-  PasteBands(bands, 4, margin);
+  PasteBands(bands, type == naxChannel2D ? 4 : 2, margin);
 }
 
 template <typename T>
