@@ -407,6 +407,14 @@ class CNaxRandom {
                                        xorshift32State);
     }
   }
+  /// One raw step of a generator, its state written back.
+  template <int Algorithm>
+  auto StepOnce() {
+    auto g = MakeEngine<Algorithm>();
+    const auto raw = g.Next();
+    g.Store();
+    return raw;
+  }
   /// `count` draws of one distribution and generator, the state kept in locals.
   template <int Algorithm, int Distribution>
   void DrawMany(int32 count, T* values);
@@ -605,26 +613,17 @@ void CNaxRandom<T>::GetArrayIntegerNumbers64(int64 low, int64 high, int64 count,
 
 template <typename T>
 uint32 CNaxRandom<T>::Xorshift32() {
-  auto g = MakeEngine<0>();
-  const uint32 raw = g.Next();
-  g.Store();
-  return raw;
+  return StepOnce<0>();
 }
 
 template <typename T>
 uint64 CNaxRandom<T>::Xorshift64() {
-  auto g = MakeEngine<1>();
-  const uint64 raw = g.Next();
-  g.Store();
-  return raw;
+  return StepOnce<1>();
 }
 
 template <typename T>
 T CNaxRandom<T>::SWB() {
-  auto g = MakeEngine<2>();
-  const T t = g.Next();
-  g.Store();
-  return t;
+  return StepOnce<2>();
 }
 
 template <typename T>
